@@ -1,0 +1,25 @@
+# Warnings, include roots and hardening shared by everything that is written here.
+find_package(Threads REQUIRED)
+
+add_library(tvx_warnings INTERFACE)
+target_compile_options(tvx_warnings INTERFACE -Wall -Wextra -Wpedantic -Wconversion -Wshadow -Werror)
+# Paths in log lines and assertions are relative to the source tree, never those of the build machine.
+target_compile_options(tvx_warnings INTERFACE
+  "-ffile-prefix-map=${CMAKE_SOURCE_DIR}/src/=" "-ffile-prefix-map=${CMAKE_SOURCE_DIR}/="
+  "-ffile-prefix-map=${CMAKE_BINARY_DIR}/=")
+
+# Everything below src/ is included as "folder/File.h"; generated headers as "generated/File.h".
+add_library(tvx_includes INTERFACE)
+target_include_directories(tvx_includes INTERFACE
+  "${CMAKE_SOURCE_DIR}/src" "${CMAKE_SOURCE_DIR}/include" "${CMAKE_BINARY_DIR}")
+
+if(CMAKE_BUILD_TYPE STREQUAL "Release")
+  add_compile_options(-fstack-protector-strong -U_FORTIFY_SOURCE -D_FORTIFY_SOURCE=2)
+  add_link_options(-Wl,-z,relro -Wl,-z,now -Wl,-z,noexecstack)
+endif()
+
+# tvx_add_library(name sources...): a static library of one source folder.
+function(tvx_add_library name)
+  add_library(${name} STATIC ${ARGN})
+  target_link_libraries(${name} PUBLIC tvx_includes PRIVATE tvx_warnings)
+endfunction()

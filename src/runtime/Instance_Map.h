@@ -1,0 +1,62 @@
+// List of instances keyed by their key properties, with a hash beside it.
+#pragma once
+
+#include <cstddef>
+#include <cstdint>
+
+#include "runtime/Provider_Operations.h"
+
+namespace cimrt {
+
+/// Owns its instances and keeps them in insertion order. `find` answers the first entry that is
+/// key-equal, in constant time. Not locked: callers hold the agent's locks.
+class Instance_Map_Base {
+ public:
+  static constexpr std::size_t npos = static_cast<std::size_t>(-1);
+
+  explicit Instance_Map_Base(const Meta_Class* meta_class);
+  ~Instance_Map_Base();
+  Instance_Map_Base(const Instance_Map_Base&) = delete;
+  Instance_Map_Base& operator=(const Instance_Map_Base&) = delete;
+
+  const Meta_Class* meta_class() const { return _meta_class; }
+  std::size_t size() const { return _instances.size(); }
+  Instance* at(std::size_t i) { return _instances[i]; }
+  const Instance* at(std::size_t i) const { return _instances[i]; }
+
+  /// Index of the first entry for which `key_eq(entry, model)` holds, or `npos`.
+  std::size_t find(const Instance* model) const;
+  Instance* lookup(const Instance* model);
+  /// A clone of the found entry into `out`: 0, or 60 when not found (`out` untouched).
+  std::int32_t get_instance(const Instance* model, Instance*& out) const;
+  /// A clone of each entry to the handler with status 0, until it answers false. Answers 0.
+  std::int32_t enum_instances(const Instance_Handler& handler) const;
+  /// Takes ownership and answers the index when the key is new; `npos`, with the instance left to
+  /// the caller, when a key-equal entry exists.
+  std::size_t insert(Instance* instance);
+  std::int32_t create_instance(const Instance* instance);  ///< inserts a clone: 0 or 80
+  std::int32_t modify_instance(const Instance* model, const Instance* instance);  ///< 0 or 100
+  std::int32_t delete_instance(const Instance* model);                            ///< 0 or 90
+  /// Destroys every entry, whatever its count.
+  void clear();
+
+  /// To be called after a key property of entry `i` was changed in place.
+  void key_changed(std::size_t i);
+
+ private:
+  struct Index;
+  const Meta_Class* _meta_class;
+  Array<Instance*> _instances;
+  Index* _index;
+};
+
+/// Typed shell.
+template <class T>
+class Instance_Map : public Instance_Map_Base {
+ public:
+  Instance_Map() : Instance_Map_Base(&T::static_meta_class) {}
+  T* operator[](std::size_t i) { return static_cast<T*>(at(i)); }
+  const T* operator[](std::size_t i) const { return static_cast<const T*>(at(i)); }
+};
+
+}  // namespace cimrt
