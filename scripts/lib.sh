@@ -1,0 +1,18 @@
+# Shared by the scripts: where the tree is, how a step is shown and how a preset is built.
+root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
+jobs=${TVX_JOBS:-$(nproc)}
+
+step() { printf '\n== %s\n' "$*"; }
+
+# configure_and_build PRESET [TARGET...]: quiet when all is well, the whole output when not.
+configure_and_build() {
+  local preset=$1 log="$root/build/$1.log"
+  shift
+  mkdir -p "$root/build"
+  if ! (cd "$root" && cmake --preset "$preset" && cmake --build --preset "$preset" -j "$jobs" ${1:+--target "$@"}) \
+      >"$log" 2>&1; then
+    tail -n 60 "$log" >&2
+    echo "building '$preset' failed; the whole log is $log" >&2
+    return 1
+  fi
+}
