@@ -1,0 +1,62 @@
+// Initialisation, attributes of adapters and ports, and the reading of attribute blocks.
+#include "lrmapi/Call.h"
+
+using namespace tvx::sim;
+
+extern "C" {
+
+RM_STATUS LRM_InitLib(void) {
+  Simulation::instance().refresh();
+  return rm_call({.name = "LRM_InitLib"}, [](World&, const Fault_Effect&) { return RM_OK; });
+}
+
+RM_STATUS LRM_ExitLib(void) {
+  return rm_call({.name = "LRM_ExitLib"}, [](World&, const Fault_Effect&) { return RM_OK; });
+}
+
+RM_STATUS LRM_SetDebugTraces(int, int) {
+  return rm_call({.name = "LRM_SetDebugTraces"}, [](World&, const Fault_Effect&) { return RM_OK; });
+}
+
+RM_STATUS LRM_GetHBAAttributes(HBA_WWN wwpn, void* block, uint32_t* size) {
+  return port_call("LRM_GetHBAAttributes", wwpn,
+                   [=](World&, const Port& port, const Fault_Effect& effect) {
+                     return answer_block(adapter_attributes(port), block, size, effect);
+                   });
+}
+
+RM_STATUS LRM_GetPortAttributes(HBA_WWN wwpn, void* block, uint32_t* size) {
+  return port_call("LRM_GetPortAttributes", wwpn,
+                   [=](World&, const Port& port, const Fault_Effect& effect) {
+                     return answer_block(port_attributes(port), block, size, effect);
+                   });
+}
+
+RM_STATUS LRM_GetDriverType(HBA_WWN wwpn, uint32_t* type) {
+  return port_call("LRM_GetDriverType", wwpn,
+                   [=](const World& world, const Port& port, const Fault_Effect&) -> RM_STATUS {
+                     if (type == nullptr) return RM_ERROR;
+                     *type = world.cards[port.card].driver_type;
+                     return RM_OK;
+                   });
+}
+
+// The block is the caller's, so neither the world nor its lock is needed; faults still apply.
+void* RM_GetAttributeValue(const void* block, uint32_t attribute, uint32_t* length,
+                           RM_STATUS* status) {
+  const std::optional<Block_Value> value = find_in_block(block, attribute);
+  std::uint32_t told = value ? value->length : 0;
+  const RM_STATUS result = rm_call({.name = "RM_GetAttributeValue"},
+                                   [&](World&, const Fault_Effect& effect) -> RM_STATUS {
+                                     if (!value || effect.omitted.contains(attribute))
+                                       return RM_ERROR;
+                                     told = effect.returned_size.value_or(told);
+                                     return RM_OK;
+                                   });
+  if (status != nullptr) *status = result;
+  if (result != RM_OK) return nullptr;
+  if (length != nullptr) *length = told;
+  return const_cast<void*>(value->data);
+}
+
+}  // extern "C"

@@ -1,0 +1,74 @@
+#include <string>
+
+#include "state/Scenario_Parts.h"
+#include "state/Simulation.h"
+#include "tvxsim/tvxsim.h"
+
+using namespace tvx::sim;
+
+namespace {
+
+thread_local std::string last_error;
+
+// Runs `body`, which answers what went wrong, and turns that into the result of a C call.
+template <class Body>
+int report(Body&& body) noexcept {
+  try {
+    last_error = body();
+  } catch (const std::exception& error) {
+    last_error = error.what();
+  }
+  return last_error.empty() ? 0 : -1;
+}
+
+}  // namespace
+
+extern "C" {
+
+int tvxsim_load(const char* path) {
+  return report([path] { return Simulation::instance().load_file(path ? path : ""); });
+}
+
+int tvxsim_load_text(const char* json) {
+  return report([json] { return Simulation::instance().load_text(json ? json : ""); });
+}
+
+const char* tvxsim_last_error(void) {
+  return last_error.c_str();
+}
+
+int tvxsim_add_fault(const char* json) {
+  return report([json] {
+    const nlohmann::json object = nlohmann::json::parse(json ? json : "");
+    Fault_Rule rule = read_fault(Json_Reader(object, ""));
+    Simulation::instance().with_world(
+        [&rule](World& world) { world.faults.push_back(std::move(rule)); });
+    return std::string();
+  });
+}
+
+void tvxsim_clear_faults(void) {
+  Simulation::instance().with_world([](World& world) { world.faults.clear(); });
+}
+
+unsigned long tvxsim_calls(const char* entry_point, const char* wwpn) {
+  unsigned long count = 0;
+  report([&] {
+    const std::optional<Wwn> port = parse_wwn(wwpn ? wwpn : "");
+    if (wwpn != nullptr && !port) return std::string(wwpn) + " is not a world wide name";
+    count = Simulation::instance().calls(entry_point ? entry_point : "", port ? &*port : nullptr);
+    return std::string();
+  });
+  return count;
+}
+
+void tvxsim_forget_calls(void) {
+  Simulation::instance().forget_calls();
+}
+
+unsigned tvxsim_open_handles(void) {
+  return Simulation::instance().with_world(
+      [](const World& world) { return static_cast<unsigned>(world.handles.size()); });
+}
+
+}  // extern "C"
