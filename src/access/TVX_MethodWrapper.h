@@ -1,0 +1,99 @@
+// The layer between the class providers and the adapter management library.
+#pragma once
+
+#include <cstdint>
+#include <string>
+
+#include "access/TVX_Runtime_Loader.h"
+
+namespace cimrt {
+
+/// What `tvxcimGetTargetMapping` finds out about one logical unit. Zero where it is not known.
+struct ExtendedLunInfo {
+  std::uint64_t BlockSize = 0;   ///< bytes
+  std::int32_t MaxLba = 0;       ///< low 32 bits of the last logical block address
+  std::uint64_t TotalBytes = 0;  ///< block size times the full last address
+  char DeviceName[256] = {};     ///< the last character is always NUL
+  std::uint8_t OsLunByte = 0;    ///< 0, or the operating system's number with bit 7 set
+};
+
+/// Length of an HBA name text: eight pairs of digits and seven colons, without the NUL.
+inline constexpr std::size_t TVX_HBA_NAME_LENGTH = 23;
+
+/// Turns text names into `HBA_WWN`s, checks that a port is local, calls one entry point, prints its
+/// status and hands it back. All operations but the constructor are static, never throw, take no
+/// lock and return an `RM_STATUS` unless told. They work between `LoadRuntimeLibraries` and
+/// `UnloadRuntimeLibraries`; without libraries they take their failure paths.
+///
+/// `wwpn` always points to the name of a port. Name texts: "device id" is 16 hexadecimal digits,
+/// "HBA name" is 23 characters, pairs of digits with colons between.
+class TVX_MethodWrapper {
+ public:
+  /// Initialises the management library under two semaphores named after the process. Throws
+  /// `std::exception` if the library refuses.
+  TVX_MethodWrapper();
+  /// Drops the first semaphore. The library stays initialised.
+  ~TVX_MethodWrapper();
+  TVX_MethodWrapper(const TVX_MethodWrapper&) = delete;
+  TVX_MethodWrapper& operator=(const TVX_MethodWrapper&) = delete;
+
+  /// Device id to HBA name. One leading double quote is passed over; no character is checked. A
+  /// text that ends early gives a shortened name, which `str2HBAName` refuses.
+  /// @param hbaName at least 24 bytes
+  /// @return 0, or 1 if a pointer is null
+  static RM_STATUS Id2HBAName(char* hbaName, const char* deviceId);
+  /// HBA name to WWN. Blanks may stand for the colons. 0, or 1 if the text is refused.
+  static RM_STATUS str2HBAName(HBA_WWN* wwn, const char* hbaName);
+  /// 16 digits to WWN. Mind the sense: 1 on success, 0 on failure.
+  static int string2HBAName(HBA_WWN* wwn, const char* text);
+  /// WWN to HBA name, upper-case, NUL-terminated. A null output is ignored. Always 0.
+  static RM_STATUS HBAName2str(char* hbaName, const HBA_WWN& wwn);
+
+  /// Both conversions of a device id in one step. 0, or 1 with "Id2HBAName failed" or "str2HBAName
+  /// failed" logged at `TVX_ERR`.
+  static RM_STATUS deviceIdToWWN(HBA_WWN* wwn, const char* deviceId);
+
+  /// 0 if the port is local, 1 if not.
+  static RM_STATUS Validatewwpn(const HBA_WWN* wwpn);
+  /// 1 if the port belongs to a converged adapter of that kind, else 0.
+  static int IsCorvanCNA(const HBA_WWN* wwpn);
+  /// Logs a status with the library's text for it.
+  static void StatusString(RM_STATUS status);
+
+  /// @param version 64 bytes
+  static RM_STATUS GetMILILibVersion(char* version);
+  /// @param version must hold what the library has: 64 bytes, or what it asks for after status 255
+  static RM_STATUS GetLibraryVersion(int selector, char* version);
+  static RM_STATUS SetMILITraceLevel(int level, int target);
+  /// @param features 512 bytes
+  static RM_STATUS GetHBAFeatureList(const HBA_WWN* wwpn, std::uint8_t* features);
+  static RM_STATUS GetQosInfo(const HBA_WWN* wwpn, void* info);
+
+  /// Size, device name and system number of one logical unit. 0 whatever the devices answer, 1 if a
+  /// name can't be converted or memory runs out.
+  static RM_STATUS tvxcimGetTargetMapping(const char* initiatorId, const char* targetId,
+                                          std::uint64_t lun, ExtendedLunInfo* info);
+  /// The operating system of the host behind a name.
+  /// @param osInfo 40 bytes; NUL-terminated only if the text is shorter than that
+  static RM_STATUS getTargetOS_info(const char* name, char* osInfo);
+
+  /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
+  /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without
+  /// memory the list is dropped and the result is 0.
+  static int isDuplicateEntryInWWPNList(const HBA_WWN* wwn, HBA_WWN*** list, int* count);
+  /// Frees such a list and sets it to null and 0.
+  static void freeWWPNList(HBA_WWN*** list, int* count);
+};
+
+/// Text attribute: the shared reader. Reads at most 255 bytes of the attribute into `value`, empty
+/// on failure; logs at `TVX_DBG` under `label`. The status, 0 on success.
+RM_STATUS readTextAttribute(const void* block, std::uint32_t attribute, const char* label,
+                            std::string& value);
+/// Number attribute. Keeps `value` on failure. A value of fewer than four bytes is widened.
+RM_STATUS readNumberAttribute(const void* block, std::uint32_t attribute, const char* label,
+                              std::uint32_t& value);
+/// Any attribute, unlogged. Null unless the library gave a value and status 0; `length` is 0 then.
+const std::uint8_t* findAttribute(const void* block, std::uint32_t attribute, std::uint32_t& length,
+                                  RM_STATUS& status);
+
+}  // namespace cimrt

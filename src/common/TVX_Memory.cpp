@@ -1,0 +1,23 @@
+#include "common/TVX_Memory.h"
+
+#include <atomic>
+
+namespace cimrt {
+
+namespace {
+
+std::atomic<TVX_Allocate_Function> installed{nullptr};
+
+}  // namespace
+
+TVX_Block tvxAllocate(std::size_t size) {
+  const TVX_Allocate_Function allocate = installed.load(std::memory_order_acquire);
+  void* block = allocate != nullptr ? allocate(size) : std::calloc(1, size != 0 ? size : 1);
+  return TVX_Block(static_cast<std::uint8_t*>(block));
+}
+
+void tvxSetAllocator(TVX_Allocate_Function allocate) {
+  installed.store(allocate, std::memory_order_release);
+}
+
+}  // namespace cimrt
