@@ -111,6 +111,9 @@ class ProviderAgent : public Agent_Maps {
   /// `m_AdapterMapsReadyMutex` and `m_DataMutex` held. 0, or MAP_BUILD_FAILED with the maps as far
   /// as they got.
   std::int32_t updateAdapterMaps();
+  /// Refills the SAN maps from the targets of the device tree; the refresh thread calls it with
+  /// `m_SANMapsReadyMutex` and `m_DataMutex` held. 0, or MAP_BUILD_FAILED.
+  std::int32_t updateSANMaps();
   /// Empties the adapter maps, in a fixed order. The caller holds `m_AdapterMapsReadyMutex`, and
   /// `m_DataMutex` unless it is the destructor.
   void clearAdapterMaps();
@@ -170,40 +173,46 @@ class ProviderAgent : public Agent_Maps {
   ProviderAgent();
   ~ProviderAgent();
 
-  // Construction and destruction, step by step (Lifecycle.cpp).
+  // Construction and destruction, step by step (ProviderAgent.cpp).
   void registerBackEnds();
   void configureLogger();
   void useDefaultLog();
   void takeSettings();
   void readHostInformation();
   void openLibraries();
+  void tearDown();
   void stopRefreshThread();
   void deleteDeviceModel();
   void ClearMaps();
-  void tearDown();
+
+  static ProviderAgent* instanceLocked();
+  static void addRefLocked();
 
   // The refresh thread (Refresh.cpp).
   static void* DataFetch_Handler(void* agent);
-  void startRefreshThread();
+  bool startRefreshThread();
   void joinRefreshThread();
   void runStages();
-  void runAdapterStage();
   void buildAdapterTree();
   void rebuildAdapterMaps();
   void runSANStage();
   void rebuildSANTargets();
   void rebuildSANMaps();
   bool finishRun();
+  void announceEndOfRun();
 
   // Enumeration behind the templates (Enumeration.cpp).
   void enumPlain(Instance_Map_Base& map, const Instance_Handler& handler);
   void enumActive(Instance_Map_Base& map, const Instance_Handler& handler, Live_Update update,
                   Ranked_Mutex& classMutex);
   void enumSAN(Instance_Map_Base& map, const Instance_Handler& handler);
+  std::uint64_t askForSANMaps();
 
   std::atomic<bool> m_bLoaded{false};
   Thread m_Thread;                 ///< handle of the last refresh thread; guarded by m_ThreadMutex
   bool m_bThreadJoinable = false;  ///< that handle was not joined yet; guarded by m_ThreadMutex
+
+  std::uint64_t m_EndedRuns = 0;   ///< runs of the thread so far; guarded by m_SANMapsReadyMutex
 
   static std::atomic<ProviderAgent*> m_pInstance;
   static std::uint32_t m_RefCount;  ///< guarded by m_InstanceMutex
