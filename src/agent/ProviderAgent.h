@@ -212,7 +212,7 @@ class ProviderAgent : public Agent_Maps {
   Thread m_Thread;                 ///< handle of the last refresh thread; guarded by m_ThreadMutex
   bool m_bThreadJoinable = false;  ///< that handle was not joined yet; guarded by m_ThreadMutex
 
-  std::uint64_t m_EndedRuns = 0;   ///< runs of the thread so far; guarded by m_SANMapsReadyMutex
+  std::uint64_t m_EndedRuns = 0;  ///< runs of the thread so far; guarded by m_SANMapsReadyMutex
 
   static std::atomic<ProviderAgent*> m_pInstance;
   static std::uint32_t m_RefCount;  ///< guarded by m_InstanceMutex

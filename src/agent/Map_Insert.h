@@ -1,0 +1,76 @@
+// Making instances and putting them into the agent's maps: what every map builder uses.
+//
+// All of it runs on the refresh thread with the agent's map and data locks held. Instances handed
+// out stay owned by their map.
+#pragma once
+
+#include <string>
+
+#include "agent/MapBuild.h"
+
+namespace cimrt {
+
+/// A new instance of T with its defaults, in the provider's namespace. The caller owns it.
+template <class T>
+Ref<T> makeInstance(const char* nameSpace = PROVIDER_NAME_SPACE) {
+  Ref<T> instance(T::create());
+  instance->__name_space = nameSpace;
+  return instance;
+}
+
+/// Formats a text as `printf` does.
+std::string formatText(const char* format, ...) __attribute__((format(printf, 1, 2)));
+
+/// Moves `instance` into `map`. False when the map holds a key-equal entry: then `failure` is
+/// logged at `TVX_CRIT` and the instance is gone.
+bool insertInstance(Instance_Map_Base& map, Ref<Instance> instance, const char* failure);
+
+/// Typed form: the entry, or null.
+template <class T>
+T* insertInto(Instance_Map<T>& map, Ref<T> instance, const char* failure) {
+  T* entry = instance.get();
+  return insertInstance(map, Ref<Instance>(instance.release()), failure) ? entry : nullptr;
+}
+
+/// Puts clones of the two ends into the references of `association`, in the order of its class.
+void setEnds(Instance* association, const Instance* first, const Instance* second);
+
+/// A new association between clones of two instances, in the provider's namespace. The caller owns
+/// it.
+template <class T>
+Ref<T> makeAssociation(const Instance* first, const Instance* second) {
+  Ref<T> association = makeInstance<T>();
+  setEnds(association.get(), first, second);
+  return association;
+}
+
+/// Makes an association and inserts it. The entry, or null with `failure` logged. With an end
+/// missing nothing is made, and that is no failure of the map: the result is null, nothing logged.
+template <class T>
+T* associate(Instance_Map<T>& map, const Instance* first, const Instance* second,
+             const char* failure) {
+  if (!first || !second) return nullptr;
+  return insertInto(map, makeAssociation<T>(first, second), failure);
+}
+
+/// The first entry of a map whose text property has that value, or null.
+template <class T>
+T* findByText(Instance_Map<T>& map, Property<String> T::*property, const std::string& text) {
+  for (std::size_t i = 0; i < map.size(); i++) {
+    const Property<String>& value = map[i]->*property;
+    if (!value.is_null() && value.value.equal(text.c_str())) return map[i];
+  }
+  return nullptr;
+}
+
+/// The same, from the end of the map: the youngest entry first.
+template <class T>
+T* findLastByText(Instance_Map<T>& map, Property<String> T::*property, const std::string& text) {
+  for (std::size_t i = map.size(); i-- > 0;) {
+    const Property<String>& value = map[i]->*property;
+    if (!value.is_null() && value.value.equal(text.c_str())) return map[i];
+  }
+  return nullptr;
+}
+
+}  // namespace cimrt
