@@ -16,6 +16,7 @@
 
 #include <atomic>
 #include <cstdint>
+#include <memory>
 
 #include "cmpi/cmpidt.h"
 #include "cmpi/cmpift.h"
@@ -97,7 +98,8 @@ class CMPI_Adapter {
   // Guarded by `static_data->load_lock`.
   std::uint64_t load_count = 0;  ///< function tables handed out
 
-  std::atomic<bool> allow_unload{true};
+  /// Cleared by a provider that must stay loaded; shared with the contexts of its threads.
+  std::shared_ptr<std::atomic<bool>> allow_unload = std::make_shared<std::atomic<bool>>(true);
 
   // Guarded by `lock`.
   Array<Indication_Filter> indication_filters;
