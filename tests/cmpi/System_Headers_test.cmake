@@ -1,0 +1,73 @@
+# Which CMPI headers the build takes. Run with -DSOURCE=<source folder> -DWORK=<scratch folder>.
+cmake_minimum_required(VERSION 3.25)
+file(REMOVE_RECURSE "${WORK}")
+file(MAKE_DIRECTORY "${WORK}/project")
+file(COPY "${SOURCE}/include/cmpi" DESTINATION "${WORK}/system")
+file(MAKE_DIRECTORY "${WORK}/unusable")
+file(WRITE "${WORK}/unusable/cmpidt.h" "typedef int CMPICount;\n")
+file(WRITE "${WORK}/project/main.cpp" "#include \"cmpi/cmpimacs.h\"\nint main() { return CMPI_RC_OK; }\n")
+file(WRITE "${WORK}/project/CMakeLists.txt" "
+cmake_minimum_required(VERSION 3.25)
+project(headers LANGUAGES CXX)
+option(TVX_SYSTEM_CMPI \"\" OFF)
+add_library(tvx_includes INTERFACE)
+target_include_directories(tvx_includes INTERFACE \"${SOURCE}/include\")
+include(\"${SOURCE}/cmake/TvxCmpi.cmake\")
+add_executable(main main.cpp)
+target_link_libraries(main PRIVATE tvx_includes)
+")
+
+# configure(name result output arguments...)
+function(configure name result_variable output_variable)
+  execute_process(COMMAND "${CMAKE_COMMAND}" -G Ninja -S "${WORK}/project" -B "${WORK}/${name}" ${ARGN}
+                  RESULT_VARIABLE result OUTPUT_VARIABLE output ERROR_VARIABLE errors)
+  string(REGEX REPLACE "[ \n]+" " " text "${output} ${errors}")
+  set(${result_variable} "${result}" PARENT_SCOPE)
+  set(${output_variable} "${text}" PARENT_SCOPE)
+endfunction()
+
+macro(expect_text output text)
+  string(FIND "${${output}}" "${text}" place)
+  if(place EQUAL -1)
+    message(SEND_ERROR "'${text}' is missing in: ${${output}}")
+  endif()
+endmacro()
+
+# Without a system's headers the own ones are taken, unless they are forbidden.
+configure(own result output -DTVX_CMPI_INCLUDE_DIR=)
+if(NOT result EQUAL 0)
+  message(SEND_ERROR "own headers: ${output}")
+endif()
+expect_text(output "CMPI headers: the project's own")
+
+configure(absent result output -DTVX_CMPI_INCLUDE_DIR= -DTVX_SYSTEM_CMPI=ON)
+if(result EQUAL 0)
+  message(SEND_ERROR "configuring must fail without a system's headers: ${output}")
+endif()
+expect_text(output "no cmpidt.h was found")
+
+# A usable set is taken, and the sources compile against it.
+configure(present result output "-DTVX_CMPI_INCLUDE_DIR=${WORK}/system/cmpi" -DTVX_SYSTEM_CMPI=ON)
+if(NOT result EQUAL 0)
+  message(SEND_ERROR "a system's headers: ${output}")
+endif()
+expect_text(output "CMPI headers: the system's")
+execute_process(COMMAND "${CMAKE_COMMAND}" --build "${WORK}/present" RESULT_VARIABLE result
+                OUTPUT_VARIABLE output ERROR_VARIABLE output)
+if(NOT result EQUAL 0)
+  message(SEND_ERROR "building against a system's headers: ${output}")
+endif()
+file(GLOB_RECURSE dependencies "${WORK}/present/system_cmpi/cmpi/cmpidt.h")
+if(NOT dependencies)
+  message(SEND_ERROR "no forwarding headers were made")
+endif()
+
+# A set that lacks names is passed over, or refused when it is asked for.
+configure(lacking result output "-DTVX_CMPI_INCLUDE_DIR=${WORK}/unusable")
+expect_text(output "CMPI headers: the project's own")
+configure(refused result output "-DTVX_CMPI_INCLUDE_DIR=${WORK}/unusable" -DTVX_SYSTEM_CMPI=ON)
+if(result EQUAL 0)
+  message(SEND_ERROR "an unusable set must be refused: ${output}")
+endif()
+expect_text(output "do not compile or lack the names")
+file(REMOVE_RECURSE "${WORK}")
