@@ -15,6 +15,7 @@
 
 #include <stdint.h>
 
+#include "rmapi/rmapi_pci.h"
 #include "rmapi/snia_hba.h"
 
 #ifdef __cplusplus
@@ -401,6 +402,8 @@ RM_STATUS LRM_DiagLoopBackTestV3(HBA_WWN wwpn, uint32_t kind, uint32_t cycles, u
 RM_STATUS LRM_DiagPciLoopBackTestV2(HBA_WWN wwpn, uint32_t cycles, uint32_t haltOnError,
                                     uint32_t* id, uint32_t option, const char* pattern);
 RM_STATUS LRM_DiagGetLoadListParams(HBA_WWN wwpn, RM_LoadList* list);
+/* Configuration registers of the port's function; size in and out. */
+RM_STATUS LRM_DiagReadPCIRegistersV2(HBA_WWN wwpn, RM_PCIRegisters* registers, uint32_t* size);
 
 /* ---- Entry points without the longer name ---- */
 

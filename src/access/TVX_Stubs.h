@@ -109,6 +109,8 @@ inline constexpr TVX_Stub<"LRM_DiagPciLoopBackTestV2", decltype(::LRM_DiagPciLoo
     LRM_DiagPciLoopBackTestV2{};
 inline constexpr TVX_Stub<"LRM_DiagGetLoadListParams", decltype(::LRM_DiagGetLoadListParams)>
     LRM_DiagGetLoadListParams{};
+inline constexpr TVX_Stub<"LRM_DiagReadPCIRegistersV2", decltype(::LRM_DiagReadPCIRegistersV2)>
+    LRM_DiagReadPCIRegistersV2{};
 inline constexpr TVX_Stub<"RM_GetAttributeValue", decltype(::RM_GetAttributeValue)>
     RM_GetAttributeValue{};
 inline constexpr TVX_Stub<"RM_GetNumberOfLocalAdapters", decltype(::RM_GetNumberOfLocalAdapters)>

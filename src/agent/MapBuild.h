@@ -62,17 +62,27 @@ struct Port_Build {
   const FCPortAttributes& attributes;
   Chip_Kind chipKind = Chip_Kind::OTHER;
   TVXHBA_Chip* chip = nullptr;
+  TVXHBA_PCIDevice* pciDevice = nullptr;
   TVXHBA_PhysicalConnector* connector = nullptr;
   TVXHBA_FCPort* fcPort = nullptr;
   TVXHBA_SCSIProtocolController* scsiController = nullptr;
   TVXHBA_PortController* controller = nullptr;
 };
 
-/// What a step decides.
-enum class Step_Result {
-  NEXT,    ///< go on with the next step
-  LEAVE,   ///< no more classes for this port (or adapter); the build goes on
-  FAILED,  ///< end the whole build; the maps stay as far as they got
-};
+/// What a step answers, beside 0 for "go on" and MAP_BUILD_FAILED for "end the whole build; the
+/// maps stay as far as they got": no more classes for this port, and on with the next one.
+inline constexpr std::int32_t MAP_BUILD_LEAVE_PORT = 0x8000;
+
+/// One step of a build, for the tables that show the order.
+template <class Build>
+using Build_Step = std::int32_t (*)(Build& build);
+
+/// Runs a table of steps until one does not answer 0. Its answer, or 0.
+template <class Build, std::size_t N>
+std::int32_t runSteps(const Build_Step<Build> (&steps)[N], Build& build) {
+  for (const Build_Step<Build> step : steps)
+    if (const std::int32_t result = step(build); result != 0) return result;
+  return 0;
+}
 
 }  // namespace cimrt
