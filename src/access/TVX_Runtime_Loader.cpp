@@ -26,12 +26,8 @@ std::array<std::atomic<void*>, TVX_LIBRARY_SLOTS> handles{};
 /// The address found for each row of the table. Writers of one row store the same value.
 std::array<std::atomic<void*>, entry_points::COUNT> addresses{};
 
-const TVX_Dl_Operations& dl() {
-  return *installedOperations.load(std::memory_order_acquire);
-}
-
 std::string lastError() {
-  const char* text = dl().error();
+  const char* text = dlOperations().error();
   return text != nullptr ? text : "";
 }
 
@@ -55,7 +51,7 @@ Family_Rule ruleOf(TVX_Family family) {
 
 /// Looks a name up in a slot. An empty slot stands for the default global scope.
 void* lookUp(TVX_Library_Slot slot, const char* name) {
-  return dl().symbol(handles[slot].load(std::memory_order_acquire), name);
+  return dlOperations().symbol(handles[slot].load(std::memory_order_acquire), name);
 }
 
 void* resolvePrimary(const TVX_Entry_Point& entry, TVX_Library_Slot slot,
@@ -77,13 +73,17 @@ void* resolveFallback(const TVX_Entry_Point& entry, std::atomic<void*>& cached) 
 
 void closeLibrary(std::atomic<void*>& slot) {
   void* const handle = slot.exchange(nullptr);
-  if (handle == nullptr || dl().close(handle) == 0) return;
+  if (handle == nullptr || dlOperations().close(handle) == 0) return;
   char value[2 + 2 * sizeof(void*) + 1];
   std::snprintf(value, sizeof value, "%p", handle);
   TVX_LOG(TVX_ERR, "dlclose for lib %s failed with %s\n", value, lastError().c_str());
 }
 
 }  // namespace
+
+const TVX_Dl_Operations& dlOperations() {
+  return *installedOperations.load(std::memory_order_acquire);
+}
 
 void setDlOperations(const TVX_Dl_Operations* operations) {
   installedOperations.store(operations != nullptr ? operations : &SYSTEM_OPERATIONS,
@@ -105,7 +105,7 @@ int OpenRuntimeLibrary(int slot, const char* name) {
   const std::string file = base.starts_with("HBA") ? base : "lib" + base + ".so";
   std::atomic<void*>& handle = handles[static_cast<std::size_t>(slot)];
   if (handle.load() != nullptr) return 1;
-  handle.store(dl().open(file.c_str(), RTLD_NOW), std::memory_order_release);
+  handle.store(dlOperations().open(file.c_str(), RTLD_NOW), std::memory_order_release);
   if (handle.load() != nullptr) return 1;
   TVX_LOG(TVX_ERR, "dlopen failed :%s", lastError().c_str());
   return 0;
