@@ -114,8 +114,8 @@ std::int32_t enum_associator_names(const Provider_Entry&, const Arguments& args)
 
 std::int32_t enum_references(const Provider_Entry&, const Arguments& args) {
   const Instance_Handler handler = args.handler(4);
-  const std::int32_t status = args.provider()->enum_references(args.instance(1), args.instance(2),
-                                                               args.text(3), handler);
+  const std::int32_t status =
+      args.provider()->enum_references(args.instance(1), args.instance(2), args.text(3), handler);
   return status == ENUM_REFERENCES_UNSUPPORTED ? status : finish(handler, status);
 }
 
