@@ -21,7 +21,7 @@ void fill(HBA_ADAPTERATTRIBUTES& out, const World& world, const Adapter& adapter
   write_text(out.OptionROMVersion, sizeof out.OptionROMVersion, card.option_rom_version, effect);
   write_text(out.FirmwareVersion, sizeof out.FirmwareVersion, card.firmware_version, effect);
   write_text(out.DriverName, sizeof out.DriverName, card.driver_name, effect);
-  out.NodeWWN = to_hba(world.ports[adapter.ports.front()].names.node);
+  out.NodeWWN = from_wwn(world.ports[adapter.ports.front()].names.node);
   out.VendorSpecificID = card.vendor_specific_id;
   out.NumberOfPorts = effect.returned_size.value_or(static_cast<HBA_UINT32>(adapter.ports.size()));
 }
@@ -32,8 +32,8 @@ void fill_types(HBA_FC4TYPES& out, const Bytes& types) {
 
 void fill(HBA_PORTATTRIBUTES& out, const Port& port, const Fault_Effect& effect) {
   std::memset(&out, 0, sizeof out);
-  out.NodeWWN = to_hba(port.names.node);
-  out.PortWWN = to_hba(port.names.port);
+  out.NodeWWN = from_wwn(port.names.node);
+  out.PortWWN = from_wwn(port.names.port);
   out.PortFcId = port.fc_id;
   out.PortType = port.type;
   out.PortState = hba_port_state(port);
@@ -45,7 +45,7 @@ void fill(HBA_PORTATTRIBUTES& out, const Port& port, const Fault_Effect& effect)
   out.PortSupportedSpeed = port.supported_speed;
   out.PortSpeed = port.speed;
   out.PortMaxFrameSize = port.max_frame_size;
-  out.FabricName = to_hba(port.fabric_name);
+  out.FabricName = from_wwn(port.fabric_name);
   out.NumberofDiscoveredPorts = port.discovered_ports;
 }
 
@@ -60,13 +60,13 @@ std::string adapter_name_at(HBA_UINT32 index) {
 extern "C" {
 
 HBA_STATUS HBA_LoadLibrary(void) {
-  Simulation::instance().refresh();
-  return hba_call({.name = "HBA_LoadLibrary"},
+  refresh_quietly();
+  return hba_call(Call_Site{.name = "HBA_LoadLibrary"},
                   [](World&, const Fault_Effect&) { return HBA_STATUS_OK; });
 }
 
 HBA_STATUS HBA_FreeLibrary(void) {
-  return hba_call({.name = "HBA_FreeLibrary"}, [](World& world, const Fault_Effect&) {
+  return hba_call(Call_Site{.name = "HBA_FreeLibrary"}, [](World& world, const Fault_Effect&) {
     world.handles.clear();
     return HBA_STATUS_OK;
   });
@@ -79,7 +79,7 @@ HBA_UINT32 HBA_GetVersion(void) {
 HBA_UINT32 HBA_GetNumberOfAdapters(void) {
   HBA_UINT32 count = 0;
   const HBA_STATUS status = hba_call(
-      {.name = "HBA_GetNumberOfAdapters"},
+      Call_Site{.name = "HBA_GetNumberOfAdapters"},
       [&count](const World& world, const Fault_Effect& effect) {
         count = effect.returned_size.value_or(static_cast<HBA_UINT32>(world.adapters.size()));
         return HBA_STATUS_OK;
@@ -92,7 +92,7 @@ HBA_STATUS HBA_GetAdapterName(HBA_UINT32 index, char* name) {
   const auto site = [index] {
     return Call_Site{.name = "HBA_GetAdapterName", .adapter = adapter_name_at(index)};
   };
-  return hba_call(site(), [=](const World& world, const Fault_Effect& effect) -> HBA_STATUS {
+  return hba_call(site, [=](const World& world, const Fault_Effect& effect) -> HBA_STATUS {
     if (name == nullptr) return HBA_STATUS_ERROR_ARG;
     if (index >= world.adapters.size()) return HBA_STATUS_ERROR_ILLEGAL_INDEX;
     write_text(name, room, world.adapters[index].name, effect);
@@ -103,7 +103,8 @@ HBA_STATUS HBA_GetAdapterName(HBA_UINT32 index, char* name) {
 HBA_HANDLE HBA_OpenAdapter(char* name) {
   if (name == nullptr) return 0;
   HBA_HANDLE handle = 0;
-  hba_call({.name = "HBA_OpenAdapter", .adapter = name}, [&](World& world, const Fault_Effect&) {
+  const auto site = [name] { return Call_Site{.name = "HBA_OpenAdapter", .adapter = name}; };
+  hba_call(site, [&](World& world, const Fault_Effect&) -> HBA_STATUS {
     for (std::size_t i = 0; i < world.adapters.size(); ++i) {
       if (world.adapters[i].name != name) continue;
       handle = world.next_handle++;
@@ -116,7 +117,7 @@ HBA_HANDLE HBA_OpenAdapter(char* name) {
 }
 
 void HBA_CloseAdapter(HBA_HANDLE handle) {
-  handle_call(site_of("HBA_CloseAdapter", handle), handle,
+  handle_call({"HBA_CloseAdapter", handle},
               [handle](World& world, const Adapter&, const Fault_Effect&) {
                 world.handles.erase(handle);
                 return HBA_STATUS_OK;
@@ -125,7 +126,7 @@ void HBA_CloseAdapter(HBA_HANDLE handle) {
 
 HBA_STATUS HBA_GetAdapterAttributes(HBA_HANDLE handle, HBA_ADAPTERATTRIBUTES* attributes) {
   return handle_call(
-      site_of("HBA_GetAdapterAttributes", handle), handle,
+      {"HBA_GetAdapterAttributes", handle},
       [=](const World& world, const Adapter& adapter, const Fault_Effect& effect) -> HBA_STATUS {
         if (attributes == nullptr) return HBA_STATUS_ERROR_ARG;
         fill(*attributes, world, adapter, effect);
@@ -136,7 +137,7 @@ HBA_STATUS HBA_GetAdapterAttributes(HBA_HANDLE handle, HBA_ADAPTERATTRIBUTES* at
 HBA_STATUS HBA_GetAdapterPortAttributes(HBA_HANDLE handle, HBA_UINT32 index,
                                         HBA_PORTATTRIBUTES* attributes) {
   return handle_call(
-      site_of("HBA_GetAdapterPortAttributes", handle, index), handle,
+      {"HBA_GetAdapterPortAttributes", handle, index},
       [=](const World& world, const Adapter& adapter, const Fault_Effect& effect) -> HBA_STATUS {
         if (attributes == nullptr) return HBA_STATUS_ERROR_ARG;
         if (index >= adapter.ports.size()) return HBA_STATUS_ERROR_ILLEGAL_INDEX;
@@ -147,7 +148,7 @@ HBA_STATUS HBA_GetAdapterPortAttributes(HBA_HANDLE handle, HBA_UINT32 index,
 
 // Nothing is cached here; the call matters to the faults, which may count it.
 void HBA_RefreshInformation(HBA_HANDLE handle) {
-  handle_call(site_of("HBA_RefreshInformation", handle), handle,
+  handle_call({"HBA_RefreshInformation", handle},
               [](World&, const Adapter&, const Fault_Effect&) { return HBA_STATUS_OK; });
 }
 

@@ -5,49 +5,42 @@
 #include <utility>
 
 #include "rmapi/snia_hba.h"
-#include "state/Fields.h"
-#include "state/Simulation.h"
+#include "state/Convert.h"
+#include "state/Entry.h"
 
 namespace tvx::sim {
 
-inline HBA_WWN to_hba(const Wwn& name) {
-  HBA_WWN result;
-  std::memcpy(result.wwn, name.data(), name.size());
-  return result;
+/// Runs one entry point; see run_entry.
+template <class Site, class Body>
+HBA_STATUS hba_call(Site&& site, Body&& body, const Failure_Outputs& outputs = {}) noexcept {
+  return run_entry<HBA_STATUS>(HBA_STATUS_ERROR, std::forward<Site>(site), outputs,
+                               std::forward<Body>(body));
 }
 
-inline Wwn from_hba(const HBA_WWN& name) {
-  Wwn result;
-  std::memcpy(result.data(), name.wwn, result.size());
-  return result;
-}
+/// A call on an open adapter, as the faults see it.
+struct Handle_Call {
+  const char* name;
+  HBA_HANDLE handle;
+  std::optional<HBA_UINT32> port_index{};  ///< the local port among those of the adapter
+  std::optional<Wwn> target{};             ///< remote port
+  std::optional<std::uint64_t> lun{};
+  std::optional<std::uint32_t> page{};
+};
 
-/// Runs one entry point: counts it, applies the faults, and gives `body` the world under the lock.
-/// A status of a fault is answered in place of the work; an exception is a plain error.
-template <class Body>
-HBA_STATUS hba_call(Call_Site site, Body&& body) noexcept {
-  try {
-    Simulation& simulation = Simulation::instance();
-    const Fault_Effect effect = simulation.begin_call(std::move(site));
-    if (effect.status) return static_cast<HBA_STATUS>(*effect.status);
-    return simulation.with_world([&](World& world) -> HBA_STATUS { return body(world, effect); });
-  } catch (...) {
-    return HBA_STATUS_ERROR;
-  }
-}
-
-/// What a call on an open adapter is about; with a port index also the port's name. A handle that
-/// is not open leaves the site without an adapter.
-Call_Site site_of(const char* name, HBA_HANDLE handle, std::optional<HBA_UINT32> port_index = {});
+/// The site of such a call; a handle that is not open leaves it without an adapter.
+Call_Site site_of(const Handle_Call& call);
 
 /// Runs a call on an open adapter, which `body` gets; a handle that is not open is an invalid one.
 template <class Body>
-HBA_STATUS handle_call(Call_Site site, HBA_HANDLE handle, Body&& body) noexcept {
-  return hba_call(std::move(site), [&](World& world, const Fault_Effect& effect) -> HBA_STATUS {
-    const auto found = world.handles.find(handle);
-    if (found == world.handles.end()) return HBA_STATUS_ERROR_INVALID_HANDLE;
-    return body(world, world.adapters[found->second], effect);
-  });
+HBA_STATUS handle_call(const Handle_Call& call, Body&& body,
+                       const Failure_Outputs& outputs = {}) noexcept {
+  return hba_call([&call] { return site_of(call); },
+                  [&](World& world, const Fault_Effect& effect) -> HBA_STATUS {
+                    const auto found = world.handles.find(call.handle);
+                    if (found == world.handles.end()) return HBA_STATUS_ERROR_INVALID_HANDLE;
+                    return body(world, world.adapters[found->second], effect);
+                  },
+                  outputs);
 }
 
 }  // namespace tvx::sim

@@ -1,52 +1,41 @@
 // What every entry point of the adapter management library goes through.
 #pragma once
 
-#include <cstring>
 #include <optional>
 #include <utility>
 
 #include "rmapi/rmapi.h"
-#include "state/Fields.h"
-#include "state/Simulation.h"
+#include "state/Convert.h"
+#include "state/Entry.h"
 
 namespace tvx::sim {
 
-inline Wwn to_wwn(const HBA_WWN& name) {
-  Wwn result;
-  std::memcpy(result.data(), name.wwn, result.size());
-  return result;
-}
-
-inline HBA_WWN from_wwn(const Wwn& name) {
-  HBA_WWN result;
-  std::memcpy(result.wwn, name.data(), name.size());
-  return result;
-}
-
-/// Runs one entry point: counts it, applies the faults, and gives `body` the world under the lock.
-/// A status of a fault is answered in place of the work; an exception is a generic failure.
+/// Runs one entry point; see run_entry.
 template <class Body>
-RM_STATUS rm_call(Call_Site site, Body&& body) noexcept {
-  try {
-    Simulation& simulation = Simulation::instance();
-    const Fault_Effect effect = simulation.begin_call(std::move(site));
-    if (effect.status) return static_cast<RM_STATUS>(*effect.status);
-    return simulation.with_world([&](World& world) -> RM_STATUS { return body(world, effect); });
-  } catch (...) {
-    return RM_ERROR;
-  }
+RM_STATUS rm_call(const Call_Site& site, Body&& body,
+                  const Failure_Outputs& outputs = {}) noexcept {
+  return run_entry<RM_STATUS>(RM_ERROR, site, outputs, std::forward<Body>(body));
 }
 
 /// The same for a call about one local port, which `body` gets; a name that no local port has is
 /// an invalid name.
 template <class Body>
-RM_STATUS port_call(const char* name, const HBA_WWN& wwpn, Body&& body) noexcept {
-  const Wwn wanted = to_wwn(wwpn);
-  return rm_call({.name = name, .port = wanted},
-                 [&](World& world, const Fault_Effect& effect) -> RM_STATUS {
-                   Port* port = world.find_port(wanted);
-                   return port == nullptr ? RM_ERROR_INVALID_WWN : body(world, *port, effect);
-                 });
+RM_STATUS port_call(const Call_Site& site, Body&& body,
+                    const Failure_Outputs& outputs = {}) noexcept {
+  return rm_call(
+      site,
+      [&](World& world, const Fault_Effect& effect) -> RM_STATUS {
+        Port* port = world.find_port(*site.port);
+        return port == nullptr ? RM_ERROR_INVALID_WWN : body(world, *port, effect);
+      },
+      outputs);
+}
+
+template <class Body>
+RM_STATUS port_call(const char* name, const HBA_WWN& wwpn, Body&& body,
+                    const Failure_Outputs& outputs = {}) noexcept {
+  return port_call(Call_Site{.name = name, .port = to_wwn(wwpn)}, std::forward<Body>(body),
+                   outputs);
 }
 
 /// Answers an attribute block under the faults of the call. `size` holds the room on the way in and

@@ -6,16 +6,19 @@ using namespace tvx::sim;
 extern "C" {
 
 RM_STATUS LRM_InitLib(void) {
-  Simulation::instance().refresh();
-  return rm_call({.name = "LRM_InitLib"}, [](World&, const Fault_Effect&) { return RM_OK; });
+  refresh_quietly();
+  return rm_call(Call_Site{.name = "LRM_InitLib"},
+                 [](World&, const Fault_Effect&) { return RM_OK; });
 }
 
 RM_STATUS LRM_ExitLib(void) {
-  return rm_call({.name = "LRM_ExitLib"}, [](World&, const Fault_Effect&) { return RM_OK; });
+  return rm_call(Call_Site{.name = "LRM_ExitLib"},
+                 [](World&, const Fault_Effect&) { return RM_OK; });
 }
 
 RM_STATUS LRM_SetDebugTraces(int, int) {
-  return rm_call({.name = "LRM_SetDebugTraces"}, [](World&, const Fault_Effect&) { return RM_OK; });
+  return rm_call(Call_Site{.name = "LRM_SetDebugTraces"},
+                 [](World&, const Fault_Effect&) { return RM_OK; });
 }
 
 RM_STATUS LRM_GetHBAAttributes(HBA_WWN wwpn, void* block, uint32_t* size) {
@@ -46,7 +49,7 @@ void* RM_GetAttributeValue(const void* block, uint32_t attribute, uint32_t* leng
                            RM_STATUS* status) {
   const std::optional<Block_Value> value = find_in_block(block, attribute);
   std::uint32_t told = value ? value->length : 0;
-  const RM_STATUS result = rm_call({.name = "RM_GetAttributeValue"},
+  const RM_STATUS result = rm_call(Call_Site{.name = "RM_GetAttributeValue"},
                                    [&](World&, const Fault_Effect& effect) -> RM_STATUS {
                                      if (!value || effect.omitted.contains(attribute))
                                        return RM_ERROR;

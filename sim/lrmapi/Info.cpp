@@ -42,23 +42,26 @@ const std::map<RM_STATUS, const char*> status_texts = {
 extern "C" {
 
 RM_STATUS RM_StatusString(RM_STATUS status, char* text, uint32_t size) {
-  return rm_call({.name = "RM_StatusString"}, [=](World&, const Fault_Effect& effect) -> RM_STATUS {
-    if (text == nullptr || size == 0) return RM_ERROR;
-    const auto found = status_texts.find(status);
-    write_text(text, size, found == status_texts.end() ? "" : found->second, effect);
-    return RM_OK;
-  });
+  return rm_call(Call_Site{.name = "RM_StatusString"},
+                 [=](World&, const Fault_Effect& effect) -> RM_STATUS {
+                   if (text == nullptr || size == 0) return RM_ERROR;
+                   const auto found = status_texts.find(status);
+                   write_text(text, size, found == status_texts.end() ? "" : found->second, effect);
+                   return RM_OK;
+                 });
 }
 
 RM_STATUS RM_MiliVersion(char* text, uint32_t size) {
-  return rm_call({.name = "RM_MiliVersion"}, [=](const World& world, const Fault_Effect& effect) {
-    return answer_text(world.library.mili_version, text, size, effect);
-  });
+  return rm_call(Call_Site{.name = "RM_MiliVersion"},
+                 [=](const World& world, const Fault_Effect& effect) {
+                   return answer_text(world.library.mili_version, text, size, effect);
+                 });
 }
 
 RM_STATUS RM_GetVersion(int selector, char* text, uint32_t* size) {
   return rm_call(
-      {.name = "RM_GetVersion"}, [=](const World& world, const Fault_Effect& effect) -> RM_STATUS {
+      Call_Site{.name = "RM_GetVersion"},
+      [=](const World& world, const Fault_Effect& effect) -> RM_STATUS {
         const auto& versions = world.library.versions;
         const auto found = versions.find(static_cast<std::uint32_t>(selector));
         if (size == nullptr || found == versions.end()) return RM_ERROR;
@@ -70,7 +73,7 @@ RM_STATUS RM_GetVersion(int selector, char* text, uint32_t* size) {
 
 RM_STATUS RM_IsLocalHBA(HBA_WWN wwpn, uint32_t* local) {
   const Wwn name = to_wwn(wwpn);
-  return rm_call({.name = "RM_IsLocalHBA", .port = name},
+  return rm_call(Call_Site{.name = "RM_IsLocalHBA", .port = name},
                  [&](World& world, const Fault_Effect&) -> RM_STATUS {
                    if (local == nullptr) return RM_ERROR;
                    *local = world.find_port(name) != nullptr ? 1 : 0;
@@ -80,17 +83,18 @@ RM_STATUS RM_IsLocalHBA(HBA_WWN wwpn, uint32_t* local) {
 
 RM_STATUS RM_ValidateWwn(HBA_WWN wwn) {
   const Wwn name = to_wwn(wwn);
-  return rm_call({.name = "RM_ValidateWwn"}, [&](World&, const Fault_Effect&) -> RM_STATUS {
-    // Names of the formats 1, 2 and 5 of the Fibre Channel standards name a port or a node.
-    const unsigned format = name[0] >> 4;
-    const bool valid = (format == 1 || format == 2 || format == 5) && wwn_number(name) != 0;
-    return valid ? RM_OK : RM_ERROR_INVALID_WWN;
-  });
+  return rm_call(
+      Call_Site{.name = "RM_ValidateWwn"}, [&](World&, const Fault_Effect&) -> RM_STATUS {
+        // Names of the formats 1, 2 and 5 of the Fibre Channel standards name a port or a node.
+        const unsigned format = name[0] >> 4;
+        const bool valid = (format == 1 || format == 2 || format == 5) && wwn_number(name) != 0;
+        return valid ? RM_OK : RM_ERROR_INVALID_WWN;
+      });
 }
 
 uint32_t RM_GetNumberOfLocalAdapters(void) {
   std::uint32_t count = 0;
-  const RM_STATUS status = rm_call({.name = "RM_GetNumberOfLocalAdapters"},
+  const RM_STATUS status = rm_call(Call_Site{.name = "RM_GetNumberOfLocalAdapters"},
                                    [&count](const World& world, const Fault_Effect&) {
                                      count = static_cast<std::uint32_t>(world.ports.size());
                                      return RM_OK;
@@ -99,7 +103,7 @@ uint32_t RM_GetNumberOfLocalAdapters(void) {
 }
 
 RM_STATUS RM_GetLocalHBAInfo(const RM_LocalHBASelector* selector, RM_LocalHBAInfo* info) {
-  return rm_call({.name = "RM_GetLocalHBAInfo"},
+  return rm_call(Call_Site{.name = "RM_GetLocalHBAInfo"},
                  [=](const World& world, const Fault_Effect&) -> RM_STATUS {
                    if (selector == nullptr || info == nullptr) return RM_ERROR;
                    if (selector->index >= world.ports.size()) return RM_ERROR;

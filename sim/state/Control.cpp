@@ -66,6 +66,10 @@ void tvxsim_forget_calls(void) {
   Simulation::instance().forget_calls();
 }
 
+void tvxsim_advance(unsigned seconds) {
+  Simulation::instance().with_world([seconds](World& world) { world.advanced += seconds; });
+}
+
 unsigned tvxsim_open_handles(void) {
   return Simulation::instance().with_world(
       [](const World& world) { return static_cast<unsigned>(world.handles.size()); });

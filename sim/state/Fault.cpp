@@ -35,6 +35,7 @@ void Fault_Effect::merge(const Fault_Effect& other) {
   garbage = garbage || other.garbage;
   if (!truncated) truncated = other.truncated;
   if (!returned_size) returned_size = other.returned_size;
+  if (sense.empty()) sense = other.sense;
 }
 
 bool Fault_Rule::fits(const Call_Site& call) const {
@@ -42,7 +43,8 @@ bool Fault_Rule::fits(const Call_Site& call) const {
     return name_fits(pattern, call.name);
   });
   return named && wanted_fits(port, call.port) && wanted_fits(target, call.target) &&
-         wanted_fits(lun, call.lun) && (adapter.empty() || adapter == call.adapter);
+         wanted_fits(lun, call.lun) && wanted_fits(page, call.page) &&
+         (adapter.empty() || adapter == call.adapter);
 }
 
 bool Fault_Rule::count_call() {

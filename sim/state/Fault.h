@@ -23,6 +23,7 @@ struct Fault_Effect {
   bool garbage = false;                        ///< the told room is filled with a byte pattern
   std::optional<std::size_t> truncated;        ///< only so many bytes are written
   std::optional<std::uint32_t> returned_size;  ///< size or count told instead of the true one
+  std::vector<std::uint8_t> sense;             ///< SCSI sense data that goes with the status
 
   void merge(const Fault_Effect& other);
 };
@@ -34,6 +35,7 @@ struct Call_Site {
   std::string adapter{};        ///< SNIA adapter name, empty when there is none
   std::optional<Wwn> target{};  ///< remote port
   std::optional<std::uint64_t> lun{};
+  std::optional<std::uint32_t> page{};  ///< of an INQUIRY; standard_page without one
 };
 
 /// One fault of a scenario. The rule counts the calls that fit it, from 1, and acts on those from
@@ -44,6 +46,7 @@ struct Fault_Rule {
   std::string adapter;
   std::optional<Wwn> target;
   std::optional<std::uint64_t> lun;
+  std::optional<std::uint32_t> page;
   std::uint64_t from = 1;
   std::uint64_t count = std::numeric_limits<std::uint64_t>::max();
   Fault_Effect effect;

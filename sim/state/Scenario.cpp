@@ -1,5 +1,6 @@
 #include "state/Scenario.h"
 
+#include <ctime>
 #include <fstream>
 #include <sstream>
 
@@ -56,10 +57,12 @@ void read_defaults(const Json_Reader& scenario) {
 }
 
 void read_library(const Json_Reader& scenario, Library_Texts& library) {
-  library.mili_version = "12.8.351.47";
-  library.versions = {{0, "12.8.351.47"}, {1, "12.8.351.47"}};
+  library.mili_version = "5.2.18.4";
+  library.versions = {{0, "5.2.18.4"}, {1, "5.2.18.4"}};
+  library.os_info = "Linux 6.1.0-18-amd64";
   const std::optional<Json_Reader> texts = scenario.object("library");
   if (!texts) return;
+  library.os_info = texts->text("os_info", library.os_info);
   library.mili_version = texts->text("mili_version", library.mili_version);
   if (const std::optional<Json_Reader> versions = texts->object("versions")) {
     for (const auto& entry : texts->raw("versions").items()) {
@@ -71,6 +74,15 @@ void read_library(const Json_Reader& scenario, Library_Texts& library) {
   texts->finish();
 }
 
+void read_global_parameters(const Json_Reader& scenario, World& world) {
+  world.global_params = made_parameters();
+  if (!scenario.has("global_driver_params")) return;
+  world.global_params.clear();
+  for (const Json_Reader& item : scenario.objects("global_driver_params")) {
+    world.global_params.push_back(read_parameter(item));
+  }
+}
+
 }  // namespace
 
 World parse_scenario(const std::string& text, const std::string& name) {
@@ -79,9 +91,11 @@ World parse_scenario(const std::string& text, const std::string& name) {
   const Json_Reader scenario(document, "");
   World world;
   world.scenario = name;
+  world.made_at = static_cast<std::int64_t>(std::time(nullptr));
   scenario.text("description", {});
   read_defaults(scenario);
   read_library(scenario, world.library);
+  read_global_parameters(scenario, world);
   for (const Json_Reader& card : scenario.objects("cards")) read_card(card, world);
   for (const Json_Reader& fault : scenario.objects("faults")) {
     world.faults.push_back(read_fault(fault));

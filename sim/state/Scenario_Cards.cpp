@@ -79,14 +79,14 @@ Card read_card_texts(const Json_Reader& card, std::size_t index) {
   result.model_description =
       card.text("model_description", "Torvex " + result.model + " PCIe Fibre Channel Adapter");
   result.hardware_version = card.text("hardware_version", "0000000b");
-  result.driver_version = card.text("driver_version", "12.8.351.47");
+  result.driver_version = card.text("driver_version", "5.2.18.4");
   result.driver_name = card.text("driver_name", "tvxfc");
   result.option_rom_version = card.text("option_rom_version", "5.30a2");
   result.firmware_version = card.text("firmware_version", "2.01a4");
-  result.node_symbolic_name =
-      card.text("node_symbolic_name", "Torvex " + result.model + " FV" + result.firmware_version +
-                                          " DV" + result.driver_version);
-  result.vendor_specific_id = card.number<std::uint32_t>("vendor_specific_id", 0xE2001D9B);
+  result.node_symbolic_name = card.text(
+      "node_symbolic_name", "Torvex " + result.model + " firmware " + result.firmware_version +
+                                " driver " + result.driver_version);
+  result.vendor_specific_id = card.number<std::uint32_t>("vendor_specific_id", 0xE3001E77);
   result.driver_type = card.number<std::uint32_t>("driver_type", 5);
   return result;
 }
@@ -205,6 +205,11 @@ Port read_port(const Json_Reader& reader, const Json_Reader& card_reader, World&
   read_attributes(reader, "adapter_attributes", card_attribute_rows(), port.card_values,
                   port.omitted);
   read_attributes(reader, "attributes", port_attribute_rows(), port.values, port.omitted);
+  read_port_features(reader, port);
+  read_product(reader, card, port);
+  for (const Json_Reader& target : reader.objects("targets")) {
+    port.targets.push_back(read_target(target));
+  }
   reader.finish();
   return port;
 }

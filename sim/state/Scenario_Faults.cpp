@@ -29,6 +29,7 @@ void read_effect(const Json_Reader& fault, Fault_Effect& effect) {
   effect.omitted = read_omitted(fault);
   effect.unterminated = fault.flag("unterminated_texts", false);
   effect.garbage = fault.flag("garbage", false);
+  effect.sense = fault.bytes("sense");
   if (fault.has("write_only")) effect.truncated = fault.number<std::uint32_t>("write_only", 0);
   if (fault.has("returned_size")) {
     effect.returned_size = fault.number<std::uint32_t>("returned_size", 0);
@@ -55,6 +56,7 @@ Fault_Rule read_fault(const Json_Reader& fault) {
   if (fault.has("port")) rule.port = fault.wwn("port", {});
   if (fault.has("target")) rule.target = fault.wwn("target", {});
   if (fault.has("lun")) rule.lun = fault.number<std::uint64_t>("lun", 0);
+  if (fault.has("page")) rule.page = fault.choice("page", 0, {{"standard", standard_page}});
   rule.adapter = fault.text("adapter", {});
   read_occasion(fault, rule);
   read_effect(fault, rule.effect);

@@ -9,6 +9,19 @@ namespace tvx::sim {
 /// Reads one element of "cards" and appends the card, its ports and its adapters to the world.
 void read_card(const Json_Reader& card, World& world);
 
+/// Reads one element of the "targets" of a port.
+Target read_target(const Json_Reader& target);
+
+/// Reads what a port offers to management; its identity and link must be known already.
+void read_port_features(const Json_Reader& port_reader, Port& port);
+/// Reads vital product data, transceiver and flash contents.
+void read_product(const Json_Reader& port_reader, const Card& card, Port& port);
+
+/// Reads one driver parameter.
+Driver_Parameter read_parameter(const Json_Reader& parameter);
+/// The parameters of a driver when a scenario names none.
+std::vector<Driver_Parameter> made_parameters();
+
 /// Reads one element of "faults".
 Fault_Rule read_fault(const Json_Reader& fault);
 

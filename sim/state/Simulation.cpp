@@ -53,6 +53,14 @@ void Simulation::refresh() {
   if (!m_bLoaded || m_Stamp != file_stamp(environment_path())) load_environment();
 }
 
+void refresh_quietly() noexcept {
+  try {
+    Simulation::instance().refresh();
+  } catch (...) {
+    return;
+  }
+}
+
 void Simulation::ensure_world() {
   if (!m_bLoaded) load_environment();
 }

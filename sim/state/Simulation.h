@@ -61,4 +61,7 @@ class Simulation {
   std::map<std::string, std::map<Wwn, std::uint64_t>, std::less<>> m_Calls;
 };
 
+/// Simulation::refresh for the C boundary: without memory the present world stays.
+void refresh_quietly() noexcept;
+
 }  // namespace tvx::sim

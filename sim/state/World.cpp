@@ -1,12 +1,45 @@
 #include "state/World.h"
 
 namespace tvx::sim {
+namespace {
+
+constexpr std::uint32_t operational_firmware_id = 0x210;
+constexpr std::uint32_t kernel_version_id = 0x222;
+
+}  // namespace
 
 Port* World::find_port(const Wwn& name) {
   for (Port& port : ports) {
     if (port.names.port == name) return &port;
   }
   return nullptr;
+}
+
+bool link_is_up(const Port& port) {
+  return port.state == 2 || port.state == 20;
+}
+
+const Target* find_target(const Port& port, const Wwn& name) {
+  if (!link_is_up(port)) return nullptr;
+  for (const Target& target : port.targets) {
+    if (target.names.port == name) return &target;
+  }
+  return nullptr;
+}
+
+void activate(Port& port, Activation event) {
+  Wwn_Store& store = port.wwns;
+  if (store.pending && store.activation <= event) {
+    port.names = *store.pending;
+    store.current_is_volatile = store.pending_is_volatile;
+    store.pending.reset();
+  }
+  if (port.firmware.pending && port.firmware.activation <= event) {
+    for (const std::uint32_t id : {operational_firmware_id, kernel_version_id}) {
+      port.card_values.insert_or_assign(id, text_value(*port.firmware.pending));
+    }
+    port.firmware.pending.reset();
+  }
 }
 
 Attribute_Map adapter_attributes(const Port& port) {

@@ -12,6 +12,13 @@ namespace tvx::sim {
 /// A port or node name, most significant byte first.
 using Wwn = std::array<std::uint8_t, 8>;
 
+/// A port name with its node name.
+struct Wwn_Pair {
+  Wwn port{};
+  Wwn node{};
+  bool operator==(const Wwn_Pair&) const = default;
+};
+
 /// Reads 16 hexadecimal digits, or eight pairs separated by ":". Nothing for any other text.
 std::optional<Wwn> parse_wwn(std::string_view text);
 

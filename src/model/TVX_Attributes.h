@@ -14,7 +14,7 @@ class Adapter;
 
 class AdapterAttributes {
  public:
-  virtual ~AdapterAttributes() noexcept(false) {}
+  virtual ~AdapterAttributes() = default;
 };
 
 /// What an FC adapter reports. Texts are empty and numbers 0 where it reports nothing.
@@ -71,19 +71,17 @@ class FCAdapterAttributes : public AdapterAttributes {
   bool BootCodeEnabled = false;
 
  private:
-  HBA_WWN readSnia(const std::string& adapterName);
+  HBA_WWN readSnia(const Adapter* adapter);
   void takeSnia(const HBA_ADAPTERATTRIBUTES& record);
   void readKeys(const HBA_WWN& wwpn, const void* block);
-  void readBoardTemperature(const HBA_WWN& wwpn, const void* block);
-  void readDriverType(const HBA_WWN& wwpn, const void* block);
-  void readIEEEAddress(const HBA_WWN& wwpn, const void* block);
-  void readBootCodeEnabled(const HBA_WWN& wwpn, const void* block);
-  struct Key;
+  void takeNumber(std::uint32_t key, std::uint32_t value);
+  void readDriverType(const HBA_WWN& wwpn);
+  void readIEEEAddress(const void* block);
 };
 
 class AdapterStatistics {
  public:
-  virtual ~AdapterStatistics() noexcept(false) {}
+  virtual ~AdapterStatistics() = default;
 };
 
 /// Carries no data.
@@ -94,7 +92,7 @@ class FCAdapterStatistics : public AdapterStatistics {
 
 class PortAttributes {
  public:
-  virtual ~PortAttributes() noexcept(false) {}
+  virtual ~PortAttributes() = default;
 };
 
 /// What an FC port reports.
@@ -128,7 +126,7 @@ class FCPortAttributes : public PortAttributes {
 
 class PortStatistics {
  public:
-  virtual ~PortStatistics() noexcept(false) {}
+  virtual ~PortStatistics() = default;
 };
 
 /// The counters of an FC port, by the statistic numbers of the management library.

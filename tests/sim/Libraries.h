@@ -28,16 +28,15 @@ class Library {
 
   bool has(const char* name) const { return dlsym(m_pHandle, name) != nullptr; }
 
-  /// Calls the entry point with the type of the declared function: `call(&LRM_InitLib,
-  /// "LRM_InitLib")` would link it, so the type comes as a template argument instead.
-  template <class Function, class... Arguments>
-  auto call(const char* name, Arguments... arguments) const {
+  /// The entry point with this name, of the type given.
+  template <class Function>
+  Function* entry(const char* name) const {
     auto* function = reinterpret_cast<Function*>(dlsym(m_pHandle, name));
     if (function == nullptr) {
       ADD_FAILURE() << name << " is missing";
       std::abort();
     }
-    return function(arguments...);
+    return function;
   }
 
  private:
@@ -45,8 +44,7 @@ class Library {
 };
 
 // Calls an entry point that is declared in the interface headers by its own name and type.
-#define SIM_CALL(library, name, ...) \
-  (library).template call<decltype(::name)>(#name __VA_OPT__(, ) __VA_ARGS__)
+#define SIM_CALL(library, name, ...) (library).entry<decltype(::name)>(#name)(__VA_ARGS__)
 
 /// Both libraries over a scenario of the test's own, with the built-in one to begin with.
 class Simulated_Host : public ::testing::Test {

@@ -37,7 +37,7 @@ TEST_F(Identity, AdapterAttributesDescribeTheCard) {
   EXPECT_STREQ(attributes.Model, "TVX16002");
   EXPECT_STREQ(attributes.FirmwareVersion, "2.01a4");
   EXPECT_STREQ(attributes.OptionROMVersion, "5.30a2");
-  EXPECT_STREQ(attributes.DriverVersion, "12.8.351.47");
+  EXPECT_STREQ(attributes.DriverVersion, "5.2.18.4");
   EXPECT_STREQ(attributes.DriverName, "tvxfc");
   EXPECT_EQ(attributes.NumberOfPorts, 1u);
   EXPECT_EQ(number(attributes.NodeWWN), 0x20000254560C4111ULL);
@@ -138,11 +138,11 @@ TEST_F(Identity, DriverTypeVersionsAndStatusTexts) {
   EXPECT_EQ(type, 5u);
   char text[64] = "";
   EXPECT_EQ(SIM_CALL(rm, RM_MiliVersion, text, 64u), 0);
-  EXPECT_STREQ(text, "12.8.351.47");
+  EXPECT_STREQ(text, "5.2.18.4");
   EXPECT_EQ(SIM_CALL(rm, RM_MiliVersion, text, 4u), RM_ERROR_VERSION_TOO_SMALL);
   std::uint32_t size = 4;
   EXPECT_EQ(SIM_CALL(rm, RM_GetVersion, 1, text, &size), RM_ERROR_VERSION_TOO_SMALL);
-  EXPECT_EQ(size, 12u);
+  EXPECT_EQ(size, 9u);
   EXPECT_EQ(SIM_CALL(rm, RM_GetVersion, 1, text, &size), 0);
   EXPECT_EQ(SIM_CALL(rm, RM_StatusString, 148, text, 64u), 0);
   EXPECT_STREQ(text, "Mailbox command failed");

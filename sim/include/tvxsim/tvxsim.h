@@ -34,6 +34,9 @@ void tvxsim_clear_faults(void);
 unsigned long tvxsim_calls(const char* entry_point, const char* wwpn);
 void tvxsim_forget_calls(void);
 
+/* Puts the clock of the counters forward. */
+void tvxsim_advance(unsigned seconds);
+
 /* SNIA handles that are open at the moment. */
 unsigned tvxsim_open_handles(void);
 
