@@ -195,10 +195,10 @@ Value typedKey(const FeatureData& feature, const Value& value, const ObjectPath&
 
 std::string printValue(const Value& value) {
   if (value.type() == CMPI_ref && !value.isNull()) {
-    return quoted(printPath(value.asReference()));
+    return quotedText(printPath(value.asReference()));
   }
   if (value.type() == CMPI_string || value.type() == CMPI_dateTime || value.isNull()) {
-    return quoted(value.display());
+    return quotedText(value.display());
   }
   return value.display();
 }
@@ -258,7 +258,7 @@ std::string printPath(const ObjectPath& path) {
   return text;
 }
 
-std::string quoted(std::string_view text) {
+std::string quotedText(std::string_view text) {
   std::string result = "\"";
   for (const char c : text) {
     if (c == '"' || c == '\\') {

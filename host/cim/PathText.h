@@ -32,6 +32,6 @@ void typeKeys(ObjectPath& path, const ClassCatalogue& classes);
 std::string printPath(const ObjectPath& path);
 
 /// `text` in double quotes with \" and \\ escapes.
-std::string quoted(std::string_view text);
+std::string quotedText(std::string_view text);
 
 }  // namespace tvx::host

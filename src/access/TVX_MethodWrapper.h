@@ -17,6 +17,11 @@ struct ExtendedLunInfo {
   std::uint8_t OsLunByte = 0;    ///< 0, or the operating system's number with bit 7 set
 };
 
+/// Bytes of a library version.
+inline constexpr std::size_t TVX_VERSION_SIZE = 64;
+/// Bytes of a target's operating system text.
+inline constexpr std::size_t TVX_OS_INFO_SIZE = 40;
+
 /// Length of an HBA name text: eight pairs of digits and seven colons, without the NUL.
 inline constexpr std::size_t TVX_HBA_NAME_LENGTH = 23;
 
@@ -62,8 +67,9 @@ class TVX_MethodWrapper {
 
   /// @param version 64 bytes
   static RM_STATUS GetMILILibVersion(char* version);
-  /// @param version must hold what the library has: 64 bytes, or what it asks for after status 255
-  static RM_STATUS GetLibraryVersion(int selector, char* version);
+  /// @param room bytes that `version` holds; a longer version is cut
+  static RM_STATUS GetLibraryVersion(int selector, char* version,
+                                     std::size_t room = TVX_VERSION_SIZE);
   static RM_STATUS SetMILITraceLevel(int level, int target);
   /// @param features 512 bytes
   static RM_STATUS GetHBAFeatureList(const HBA_WWN* wwpn, std::uint8_t* features);
@@ -84,16 +90,5 @@ class TVX_MethodWrapper {
   /// Frees such a list and sets it to null and 0.
   static void freeWWPNList(HBA_WWN*** list, int* count);
 };
-
-/// Text attribute: the shared reader. Reads at most 255 bytes of the attribute into `value`, empty
-/// on failure; logs at `TVX_DBG` under `label`. The status, 0 on success.
-RM_STATUS readTextAttribute(const void* block, std::uint32_t attribute, const char* label,
-                            std::string& value);
-/// Number attribute. Keeps `value` on failure. A value of fewer than four bytes is widened.
-RM_STATUS readNumberAttribute(const void* block, std::uint32_t attribute, const char* label,
-                              std::uint32_t& value);
-/// Any attribute, unlogged. Null unless the library gave a value and status 0; `length` is 0 then.
-const std::uint8_t* findAttribute(const void* block, std::uint32_t attribute, std::uint32_t& length,
-                                  RM_STATUS& status);
 
 }  // namespace cimrt

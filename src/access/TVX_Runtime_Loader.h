@@ -60,6 +60,10 @@ struct TVX_Dl_Operations {
 /// Installs replacements; null goes back to the system's. The object must stay.
 void setDlOperations(const TVX_Dl_Operations* operations);
 
+/// The dynamic linker in use: the installed replacement, or the system's. For whoever opens a
+/// library that is not one of the management libraries. Any thread.
+const TVX_Dl_Operations& dlOperations();
+
 /// A name as a template argument.
 template <std::size_t N>
 struct TVX_Name {

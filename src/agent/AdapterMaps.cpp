@@ -64,6 +64,16 @@ std::int32_t requireDeviceTree(Host_Build& host) {
   return MAP_BUILD_FAILED;
 }
 
+/// Keeps the name of port 0 of the first FC adapter; it stays empty without such a port.
+std::int32_t findFirstPort(Host_Build& host) {
+  for (Adapter* adapter : host.agent.m_pData->m_Adapters) {
+    if (adapter->m_Type != TVX_ADAPTER_TYPE_FC) continue;
+    if (adapter->getNumberOfPorts() > 0) host.firstPortName = adapter->getPort(0)->m_Name;
+    break;
+  }
+  return 0;
+}
+
 /// An exception ends the walk over the adapters; what comes after it is still built.
 std::int32_t buildAdapters(Host_Build& host) {
   try {

@@ -30,9 +30,9 @@ inline constexpr std::uint32_t E200_DEVICE_ID = 0xE200;
 struct Host_Build {
   ProviderAgent& agent;
   CIM_ComputerSystem* system = nullptr;  ///< entry 0 of its map
-  Ref<CIM_Chassis> platformChassis;      ///< found by the up-call; in no map
+  Ref<CIM_Chassis> platformChassis{};    ///< found by the up-call; in no map
   CIM_Chassis* chassis = nullptr;        ///< the platform's or our own
-  std::string firstPortName;             ///< WWPN of port 0 of the first FC adapter, or empty
+  std::string firstPortName{};           ///< WWPN of port 0 of the first FC adapter, or empty
   TVXHBA_SoftwareIdentity* providerIdentity = nullptr;
   TVXHBA_SoftwareIdentity* driverIdentity = nullptr;
   TVXHBA_SoftwareInstallationService* installationService = nullptr;

@@ -15,8 +15,6 @@ std::int32_t buildComputerSystem(Host_Build& host);
 std::int32_t findPlatformChassis(Host_Build& host);
 /// Makes a chassis where the platform has none.
 std::int32_t buildOwnChassis(Host_Build& host);
-/// Keeps the name of port 0 of the first FC adapter.
-std::int32_t findFirstPort(Host_Build& host);
 
 // --- Adapter (PackageInstances.cpp, CardInstances.cpp)
 

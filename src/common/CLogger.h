@@ -89,8 +89,9 @@ class CLogger {
   ~CLogger() = default;
 
   struct Dump_Settings;
-  bool parseDump(std::FILE* stream, const char* path, Dump_Settings& settings);
-  TVX_FileLogger* fileLogger();
+  bool parseDump(char* line, const char* path, Dump_Settings& settings);
+  bool takeDumpPath(const char* path);
+  TVX_FileLogger* fileLogger();  // caller holds the log mutex
 
   std::atomic<int> m_Mode{0};
   std::atomic<int> m_Level{0};

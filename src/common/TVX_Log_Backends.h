@@ -12,8 +12,8 @@
 
 namespace cimrt {
 
-/// One back end. It looks at the logger's mode by itself. A back end may be called from several
-/// threads at once and never logs.
+/// One back end. It looks at the logger's mode by itself, registers with the logger while it lives,
+/// may be called from several threads at once and never logs.
 class TVX_LoggerInterface {
  public:
   virtual ~TVX_LoggerInterface() = default;
@@ -27,8 +27,8 @@ class TVX_LoggerInterface {
 /// Writes lines to a file, in modes 2 and 4.
 class TVX_FileLogger : public TVX_LoggerInterface {
  public:
-  TVX_FileLogger() = default;
-  ~TVX_FileLogger() override;  ///< closes the stream
+  TVX_FileLogger();            ///< registers itself with the logger
+  ~TVX_FileLogger() override;  ///< leaves the logger and closes the stream
   TVX_FileLogger(const TVX_FileLogger&) = delete;
   TVX_FileLogger& operator=(const TVX_FileLogger&) = delete;
 
@@ -71,7 +71,10 @@ class TVX_CIMLogger : public TVX_LoggerInterface {
     char text[TEXT_SIZE] = {};  ///< "[message]", cut to the field, NUL-terminated
   };
 
-  explicit TVX_CIMLogger(std::int32_t capacity = DEFAULT_CAPACITY);
+  explicit TVX_CIMLogger(std::int32_t capacity = DEFAULT_CAPACITY);  ///< registers itself
+  ~TVX_CIMLogger() override;
+  TVX_CIMLogger(const TVX_CIMLogger&) = delete;
+  TVX_CIMLogger& operator=(const TVX_CIMLogger&) = delete;
 
   void log(int level, const char* file, const unsigned* line, const char* text) override;
   void open() override {}
@@ -88,15 +91,14 @@ class TVX_CIMLogger : public TVX_LoggerInterface {
   const std::int32_t m_Capacity;
   mutable Mutex m_Mutex;  // guards everything below
   std::int32_t m_LastIndex = -1;
-  std::int32_t m_Flag = 1;
   std::vector<Record> m_Records;
 };
 
 /// The system log. Its filter passes none of the levels in use.
 class TVX_SysLogger : public TVX_LoggerInterface {
  public:
-  TVX_SysLogger();            ///< opens the system log
-  ~TVX_SysLogger() override;  ///< closes it
+  TVX_SysLogger();            ///< opens the system log and registers itself with the logger
+  ~TVX_SysLogger() override;  ///< leaves the logger and closes the system log
   TVX_SysLogger(const TVX_SysLogger&) = delete;
   TVX_SysLogger& operator=(const TVX_SysLogger&) = delete;
 

@@ -3,6 +3,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 
 #include "runtime/Threads.h"
 
@@ -22,8 +23,9 @@ class TvxConfigFile {
   TvxConfigFile(const TvxConfigFile&) = delete;
   TvxConfigFile& operator=(const TvxConfigFile&) = delete;
 
-  /// Remembers the path and takes the valid settings of the file. A missing file leaves the
-  /// defaults. Null does nothing. Takes no lock: call it before other threads know the object.
+  /// Remembers the path (opened as given) and takes the valid settings of the file. A missing file
+  /// leaves the defaults. Null does nothing. Takes no lock: call it before other threads know the
+  /// object.
   void load(const char* path);
 
   /// Minutes, 1 to 30. 0, or -1 with nothing changed.
@@ -43,7 +45,8 @@ class TvxConfigFile {
 
  private:
   struct Keys_Set;
-  void takeLine(std::string& line, Keys_Set& set);
+  void takeLine(std::string_view text, Keys_Set& set);
+  int setTruth(bool& setting, std::uint32_t value);
   void write();
 
   bool m_bRefreshAdapterData = false;

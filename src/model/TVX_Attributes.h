@@ -14,7 +14,7 @@ class Adapter;
 
 class AdapterAttributes {
  public:
-  virtual ~AdapterAttributes() = default;
+  virtual ~AdapterAttributes() noexcept(false) {}
 };
 
 /// What an FC adapter reports. Texts are empty and numbers 0 where it reports nothing.
@@ -71,17 +71,19 @@ class FCAdapterAttributes : public AdapterAttributes {
   bool BootCodeEnabled = false;
 
  private:
-  HBA_WWN readSnia(const Adapter* adapter);
+  HBA_WWN readSnia(const std::string& adapterName);
   void takeSnia(const HBA_ADAPTERATTRIBUTES& record);
   void readKeys(const HBA_WWN& wwpn, const void* block);
-  void takeNumber(std::uint32_t key, std::uint32_t value);
-  void readDriverType(const HBA_WWN& wwpn);
-  void readIEEEAddress(const void* block);
+  void readBoardTemperature(const HBA_WWN& wwpn, const void* block);
+  void readDriverType(const HBA_WWN& wwpn, const void* block);
+  void readIEEEAddress(const HBA_WWN& wwpn, const void* block);
+  void readBootCodeEnabled(const HBA_WWN& wwpn, const void* block);
+  struct Key;
 };
 
 class AdapterStatistics {
  public:
-  virtual ~AdapterStatistics() = default;
+  virtual ~AdapterStatistics() noexcept(false) {}
 };
 
 /// Carries no data.
@@ -92,7 +94,7 @@ class FCAdapterStatistics : public AdapterStatistics {
 
 class PortAttributes {
  public:
-  virtual ~PortAttributes() = default;
+  virtual ~PortAttributes() noexcept(false) {}
 };
 
 /// What an FC port reports.
@@ -126,7 +128,7 @@ class FCPortAttributes : public PortAttributes {
 
 class PortStatistics {
  public:
-  virtual ~PortStatistics() = default;
+  virtual ~PortStatistics() noexcept(false) {}
 };
 
 /// The counters of an FC port, by the statistic numbers of the management library.

@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "common/TVX_Memory.h"
 #include "model/TVX_Attributes.h"
 #include "model/TVX_Target.h"
 
@@ -38,6 +39,10 @@ class Data {
   std::vector<Port*> m_Ports;        ///< not owned: every port of every adapter
   bool m_bFCCardFound = false;       ///< at least one adapter was kept
   std::uint32_t m_AdapterCount = 0;  ///< adapters reported, less the skipped ones
+
+ private:
+  void buildAdapter(std::uint32_t index);
+  void keepAdapter(Adapter* adapter);
 };
 
 /// One adapter. Owns its attributes, statistics and ports.
@@ -49,7 +54,7 @@ class Adapter {
   /// an owner.
   Adapter(const Adapter& other);
   Adapter& operator=(const Adapter&) = delete;
-  virtual ~Adapter();
+  virtual ~Adapter() noexcept(false);
 
   virtual const std::string& getName() const = 0;
   virtual const std::int32_t& getNumber() const = 0;
@@ -78,7 +83,7 @@ class Adapter {
 class FCAdapter : public Adapter {
  public:
   FCAdapter(const std::string& name, std::int32_t number);
-  ~FCAdapter() override;
+  ~FCAdapter() noexcept(false) override;
 
   const std::string& getName() const override { return m_Name; }
   const std::int32_t& getNumber() const override { return m_Number; }
@@ -92,7 +97,6 @@ class FCAdapter : public Adapter {
 
  private:
   void buildPorts(std::uint32_t count);
-  void freeParts();
 };
 
 /// One port. Owns its attributes, statistics and targets.
@@ -101,7 +105,7 @@ class Port {
   explicit Port(Adapter* adapter);
   Port(const Port&) = delete;
   Port& operator=(const Port&) = delete;
-  virtual ~Port();  ///< frees the targets
+  virtual ~Port() noexcept(false);  ///< frees the targets
 
   virtual PortAttributes* getAttributes() = 0;
   /// Reads the statistics afresh. The old ones stay if that throws.
@@ -130,7 +134,7 @@ class Port {
 class FCPort : public Port {
  public:
   FCPort(Adapter* adapter, std::uint32_t index);
-  ~FCPort() override;
+  ~FCPort() noexcept(false) override;
 
   PortAttributes* getAttributes() override { return m_pAttributes; }
   PortStatistics* refreshStatistics() override;
@@ -141,6 +145,10 @@ class FCPort : public Port {
   std::size_t getNumberOfTargets() override { return m_Targets.size(); }
 
   std::string m_NodeName;  ///< the WWNN, 16 upper-case digits
+
+ private:
+  HBA_STATUS getFcpTargetMapping(HBA_HANDLE handle, TVX_Block& mapping, std::uint32_t& rows);
+  void buildTargets(Adapter* adapter, const TVX_Block& mapping, std::uint32_t rows);
 };
 
 }  // namespace cimrt

@@ -39,7 +39,7 @@ class Target {
   Target(Adapter* adapter, Port* port, const HBA_FCPSCSIENTRY& row);
   Target(const Target&) = delete;
   Target& operator=(const Target&) = delete;
-  virtual ~Target() = default;
+  virtual ~Target() noexcept(false) {}
 
   std::uint32_t fcId = 0;
   std::string nodeWWN;       ///< 16 upper-case digits
@@ -58,11 +58,14 @@ class Target {
   std::string serialNumber;
   DeviceIdentification deviceIdentification;
 
+ protected:
+  Target() = default;  ///< asks nothing
+
  private:
-  void inquireStandard(HBA_HANDLE handle, HBA_WWN wwpn);
-  void inquireSerialNumber(HBA_HANDLE handle, HBA_WWN wwpn);
-  void inquireIdentification(HBA_HANDLE handle, HBA_WWN wwpn);
-  void readCapacity(HBA_HANDLE handle, HBA_WWN wwpn);
+  void inquireStandard(HBA_HANDLE handle, const HBA_WWN& wwpn);
+  void inquireSerialNumber(HBA_HANDLE handle, const HBA_WWN& wwpn);
+  void inquireIdentification(HBA_HANDLE handle, const HBA_WWN& wwpn);
+  void readCapacity(HBA_HANDLE handle, const HBA_WWN& wwpn);
 };
 
 }  // namespace cimrt

@@ -1,10 +1,10 @@
 #!/usr/bin/env python3
 """Makes the class data of the provider and of the host programs from the class descriptions.
 
-    generate.py --output FOLDER [--schema FOLDER]     write the generated files
-    generate.py --check [--schema FOLDER]             only read and check the descriptions
+    generate.py --output FOLDER     write the generated files
+    generate.py --check             only read and check the descriptions
 
-The schema folder holds *.mof, catalogue.txt and agent_maps.txt. A mistake in one of them is reported as
+The schema folder holds *.mof, catalogue.txt and agent_maps.txt; the providers file says how classes are served. A mistake in one of them is reported as
 "file:line: what is wrong" and ends the program with status 1. Files whose text does not change are not touched.
 """
 
@@ -14,7 +14,8 @@ from pathlib import Path
 
 sys.dont_write_bytecode = True
 
-from generator import catalogue, class_model, emit_host, emit_records, emit_repository, mof_reader
+from generator import (catalogue, class_model, emit_host, emit_methods, emit_module, emit_records, emit_repository,
+                       mof_reader)
 from generator.errors import SchemaError
 from generator.writer import Output
 
@@ -29,18 +30,23 @@ def read_schema(folder):
     return classes, rows
 
 
-def generate(classes, rows, maps, output):
-    served = [row.name for row in rows]
+def generate(classes, served, maps, servings, output):
     order = served + [name for name in classes if name not in set(served)]
     emit_records.records(output, classes)
     emit_records.agent_maps(output, maps)
-    emit_repository.repository(output, classes, order)
+    emit_repository.repository(output, classes, order, len(served))
+    emit_methods.methods(output, classes, served)
+    emit_module.registrations(output, classes, served, servings, maps)
+    emit_module.factories(output, classes, served)
+    emit_module.exports(output, classes, served)
     emit_host.class_data(output, classes, set(served))
 
 
 def main():
     parser = argparse.ArgumentParser(description=__doc__.split("\n")[0])
-    parser.add_argument("--schema", type=Path, default=Path(__file__).resolve().parent)
+    here = Path(__file__).resolve().parent
+    parser.add_argument("--schema", type=Path, default=here)
+    parser.add_argument("--providers", type=Path, default=here.parent / "derivedObjects" / "providers.txt")
     parser.add_argument("--output", type=Path)
     parser.add_argument("--check", action="store_true")
     arguments = parser.parse_args()
@@ -49,8 +55,10 @@ def main():
     try:
         classes, rows = read_schema(arguments.schema)
         maps = emit_records.read_maps(arguments.schema / "agent_maps.txt", classes)
+        served = [row.name for row in rows]
+        servings = emit_module.read_providers(arguments.providers, served)
         if not arguments.check:
-            generate(classes, rows, maps, Output(arguments.output))
+            generate(classes, served, maps, servings, Output(arguments.output))
     except SchemaError as error:
         print(error, file=sys.stderr)
         return 1

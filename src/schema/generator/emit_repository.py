@@ -97,20 +97,23 @@ def class_definition(cls, tables, locals_pool):
             f"    &locals[{local}], {parent}, {len(cls.keys)}, &meta_repository}};\n")
 
 
-def repository(output, classes, order):
+def repository(output, classes, order, num_served):
     tables, locals_pool = Tables(classes), Pool()
     definitions = "".join(class_definition(classes[name], tables, locals_pool) for name in order)
     plain, values = tables.value_definitions()
-    output.write("Repository.h", "src/schema/*.mof", """#pragma once
+    output.write("Repository.h", "src/schema/*.mof", f"""#pragma once
 
 #include "runtime/Meta_Class.h"
 
-namespace cimrt {
+namespace cimrt {{
 
 /// Every class that the system knows, the provider's own first.
 extern const Meta_Repository meta_repository;
 
-}  // namespace cimrt
+/// Number of the provider's own classes.
+inline constexpr std::size_t num_provider_classes = {num_served};
+
+}}  // namespace cimrt
 """)
     output.write("Repository.cpp", "src/schema/*.mof", f"""#include "generated/Repository.h"
 
