@@ -1,7 +1,11 @@
 // The order in which the adapter maps are refilled.
 #include <exception>
 
+#include "agent/HostedServices.h"
 #include "agent/MapSteps.h"
+#include "agent/ProviderConfigSettings.h"
+#include "agent/RegisteredProfiles.h"
+#include "agent/SoftwareIdentities.h"
 
 namespace cimrt {
 
@@ -9,14 +13,27 @@ namespace {
 
 // --- One port ------------------------------------------------------------------------------------
 
+// clang-format off: one step a line
 constexpr Build_Step<Port_Build> PORT_STEPS[] = {
-    classifyChip,           associateNewCard,
-    CreateChipInstances,    CreatePhysicalConnectorInstances,
-    insertFCPort,           associateFCPort,
-    buildPortStatistics,    buildSCSIController,
-    buildPortController,    associatePortController,
+    classifyChip,
+    associateNewCard,
+    CreateChipInstances,
+    CreatePCIDeviceInstance,
+    CreatePhysicalConnectorInstances,
+    insertFCPort,
+    conformFCPort,
+    associateFCPort,
+    buildPortStatistics,
+    buildSCSIController,
+    buildPortController,
+    conformPortController,
+    associatePortController,
     buildInitiatorEndpoint,
+    buildPortSoftware,
+    offerAccessPoint,
+    buildServiceAssociations,
 };
+// clang-format on
 
 std::int32_t buildPort(Adapter_Build& adapter, int position) {
   TVX_LOG(TVX_DBG, "Creating classes for port %d.", position);
@@ -85,10 +102,11 @@ std::int32_t buildAdapters(Host_Build& host) {
   return 0;
 }
 
+// clang-format off: one step a line
 constexpr Build_Step<Host_Build> CARD_STEPS[] = {
-    findFirstPort,
-    buildAdapters,
+    findFirstPort, buildProviderIdentity, buildProviderConfigSettings, startServices, buildAdapters,
 };
+// clang-format on
 
 std::int32_t buildCards(Host_Build& host) {
   if (!host.agent.m_pData->m_bFCCardFound) {
@@ -98,9 +116,12 @@ std::int32_t buildCards(Host_Build& host) {
   return runSteps(CARD_STEPS, host);
 }
 
+// clang-format off: one step a line
 constexpr Build_Step<Host_Build> HOST_STEPS[] = {
-    buildComputerSystem, findPlatformChassis, requireDeviceTree, buildOwnChassis, buildCards,
+    buildComputerSystem, findPlatformChassis, registerBaseProfiles, requireDeviceTree,
+    buildOwnChassis,     buildCards,          buildRecordLog,
 };
+// clang-format on
 
 }  // namespace
 

@@ -1,6 +1,7 @@
 // The card, and what ties a new one to the rest.
 #include "agent/MapSteps.h"
 #include "agent/Map_Insert.h"
+#include "agent/RegisteredProfiles.h"
 
 namespace cimrt {
 
@@ -46,6 +47,21 @@ std::int32_t CreateCardInstances(Adapter_Build& build) {
   return build.card ? 0 : MAP_BUILD_FAILED;
 }
 
+namespace {
+
+/// The provider's identity stands for the card's software: current, and installed.
+void tieCardToProvider(const Adapter_Build& adapter) {
+  if (!adapter.host.providerIdentity) return;
+  Ref<TVXHBA_ProviderElementSoftwareIdentity> tie =
+      makeAssociation<TVXHBA_ProviderElementSoftwareIdentity>(adapter.host.providerIdentity,
+                                                              adapter.card);
+  tie->ElementSoftwareStatus.set({2, 6});
+  insertInto(adapter.host.agent.m_TVXHBA_ProviderElementSoftwareIdentity_map, std::move(tie),
+             "Insert Failed (CNA): m_TVXHBA_ProviderElementSoftwareIdentity_map");
+}
+
+}  // namespace
+
 std::int32_t associateNewCard(Port_Build& build) {
   const Adapter_Build& adapter = build.adapter;
   if (!adapter.cardIsNew) return 0;
@@ -53,6 +69,10 @@ std::int32_t associateNewCard(Port_Build& build) {
   ProviderAgent& agent = adapter.host.agent;
   associate(agent.m_TVXHBA_ProductPhysicalComponent_map, adapter.product, adapter.card,
             "Insert Failed : m_TVXHBA_ProductPhysicalComponent_map");
+  tieCardToProvider(adapter);
+  associate(agent.m_TVXHBA_CardConformsToProfile_map,
+            findRegisteredProfile(agent, "Physical Asset"), adapter.card,
+            "Insert Failed : m_TVXHBA_CardConformsToProfile_map");
   associate(agent.m_TVXHBA_ChassisContainsCard_map, adapter.host.chassis, adapter.card,
             "Insert Failed:TVXHBA_ChassisContainsCard");
   return 0;

@@ -119,4 +119,13 @@ std::int32_t buildPortStatistics(Port_Build& build) {
   return done ? 0 : MAP_BUILD_FAILED;
 }
 
+std::int32_t offerAccessPoint(Port_Build& build) {
+  const Host_Build& host = build.adapter.host;
+  if (!host.accessPoint) return 0;
+  return associate(host.agent.m_TVXHBA_SAPAvailableForElement_map, host.accessPoint, build.fcPort,
+                   "Insert Failed : m_TVXHBA_SAPAvailableForElement_map")
+             ? 0
+             : MAP_BUILD_FAILED;
+}
+
 }  // namespace cimrt

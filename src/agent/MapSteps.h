@@ -6,7 +6,7 @@
 
 namespace cimrt {
 
-// --- Host (ComputerSystem.cpp, Chassis.cpp, ConfigSettings.cpp, RecordLog.cpp)
+// --- Host (ComputerSystem.cpp, Chassis.cpp, RecordLog.cpp)
 
 /// Takes the platform's computer system over, or makes one from what the host says of itself, and
 /// puts it into its map as entry 0.
@@ -15,6 +15,8 @@ std::int32_t buildComputerSystem(Host_Build& host);
 std::int32_t findPlatformChassis(Host_Build& host);
 /// Makes a chassis where the platform has none.
 std::int32_t buildOwnChassis(Host_Build& host);
+/// The provider's record log with its capabilities, its profile and its writer.
+std::int32_t buildRecordLog(Host_Build& host);
 
 // --- Adapter (PackageInstances.cpp, CardInstances.cpp)
 
@@ -48,6 +50,13 @@ std::int32_t insertFCPort(Port_Build& build);
 std::int32_t associateFCPort(Port_Build& build);
 /// Its statistics, unset until they are first read.
 std::int32_t buildPortStatistics(Port_Build& build);
+/// The management page's access point, for the port, if there is one.
+std::int32_t offerAccessPoint(Port_Build& build);
+
+// --- Port (PortConformance.cpp). Failures are logged and not looked at.
+
+std::int32_t conformFCPort(Port_Build& build);
+std::int32_t conformPortController(Port_Build& build);
 
 // --- Port (PortControllers.cpp)
 

@@ -4,6 +4,7 @@
 #include "access/TVX_MethodWrapper.h"
 #include "agent/MapSteps.h"
 #include "agent/Map_Insert.h"
+#include "agent/RegisteredProfiles.h"
 
 namespace cimrt {
 
@@ -224,19 +225,43 @@ bool convertName(const std::string& wwpn, HBA_WWN& wwn) {
 
 }  // namespace
 
-std::int32_t CreatePCIDeviceInstance(Port_Build& build) {
-  ProviderAgent& agent = build.adapter.host.agent;
+namespace {
+
+/// 0, MAP_BUILD_FAILED, or MAP_BUILD_LEAVE_PORT for a port without a PCI view.
+std::int32_t conformDevice(ProviderAgent& agent, const Device* device) {
+  const TVXHBA_RegisteredProfile* profile = findRegisteredProfile(agent, "PCI Device");
+  if (!profile) {
+    TVX_LOG(TVX_CRIT, "Failed to create TVXHBA_PCIElementConformsToProfile");
+    return MAP_BUILD_LEAVE_PORT;
+  }
+  return associate(agent.m_TVXHBA_PCIElementConformsToProfile_map, profile, device,
+                   "Insert Failed : m_TVXHBA_PCIElementConformsToProfile_map")
+             ? 0
+             : MAP_BUILD_FAILED;
+}
+
+std::int32_t buildDevice(Port_Build& build) {
+  const Host_Build& host = build.adapter.host;
   HBA_WWN wwpn{};
   if (!convertName(build.port.m_Name, wwpn)) return MAP_BUILD_FAILED;
-  Device* device =
-      insertInto(agent.m_TVXHBA_PCIDevice_map, describeDevice(build, readRegisters(wwpn)),
+  build.pciDevice =
+      insertInto(host.agent.m_TVXHBA_PCIDevice_map, describeDevice(build, readRegisters(wwpn)),
                  "Insert Failed : m_TVXHBA_PCIDevice_map");
-  if (!device) return MAP_BUILD_FAILED;
-  build.pciDevice = device;
-  return associate(agent.m_TVXHBA_SystemDevice_map, build.adapter.host.system, device,
+  if (!build.pciDevice) return MAP_BUILD_FAILED;
+  const std::int32_t result = conformDevice(host.agent, build.pciDevice);
+  if (result != 0) return result;
+  return associate(host.agent.m_TVXHBA_SystemDevice_map, host.system, build.pciDevice,
                    "Insert Failed : m_TVXHBA_SystemDevice_map")
              ? 0
              : MAP_BUILD_FAILED;
+}
+
+}  // namespace
+
+std::int32_t CreatePCIDeviceInstance(Port_Build& build) {
+  const std::int32_t result = buildDevice(build);
+  if (result == MAP_BUILD_FAILED) TVX_LOG(TVX_CRIT, "CreatePCIDeviceInstance failed");
+  return result;
 }
 
 }  // namespace cimrt
