@@ -5,6 +5,7 @@
 #include <string>
 
 #include "access/TVX_Runtime_Loader.h"
+#include "common/TVX_Memory.h"
 
 namespace cimrt {
 
@@ -82,6 +83,16 @@ class TVX_MethodWrapper {
   /// The operating system of the host behind a name.
   /// @param osInfo 40 bytes; NUL-terminated only if the text is shorter than that
   static RM_STATUS getTargetOS_info(const char* name, char* osInfo);
+
+  /// The virtual ports of a local port. The status, or RM_ERROR with the reason logged.
+  /// @param list takes an `RM_VPortList` whose count never exceeds what it holds; the caller owns
+  /// it
+  static RM_STATUS ListVPorts(const HBA_WWN* wwpn, TVX_Block* list);
+  /// What the library says of one of them.
+  /// @param attributes takes an `RM_VPortAttributes`, whose texts need not be terminated; the
+  /// caller owns it
+  static RM_STATUS ListVPortAttributes(const HBA_WWN* wwpn, const HBA_WWN& vport,
+                                       TVX_Block* attributes);
 
   /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
   /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without

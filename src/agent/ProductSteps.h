@@ -1,0 +1,25 @@
+// Steps of the adapter maps that the folder of the services implements: product data, transceivers,
+// flash contents, virtual ports. They are declared here because the agent's tables name them.
+#pragma once
+
+#include "agent/MapBuild.h"
+
+namespace cimrt {
+
+/// Takes the field replaceable unit's data over to the card. The chip's kind must be known.
+std::int32_t updateCardFromFRU(Port_Build& build);
+/// The port's vital product data, tied to its PCI device. A port without them is no failure.
+std::int32_t buildVitalProductData(Port_Build& build);
+/// The port's transceiver, tied to its controller. A port without one is no failure.
+std::int32_t buildTransceiver(Port_Build& build);
+/// The programs in the port's flash, tied to the port. A port without them is no failure.
+std::int32_t buildFlashImages(Port_Build& build);
+/// Takes the unit's data over to the software of the ports. Never a failure of the build.
+std::int32_t updateSoftwareFromFRU(Host_Build& host);
+/// The virtual ports and their pools. Never a failure of the build.
+std::int32_t buildVirtualPorts(Host_Build& host);
+
+/// Empties the maps of the virtual ports. Always 0.
+std::int32_t ClearPortVirtualizationMaps(Agent_Maps& maps);
+
+}  // namespace cimrt
