@@ -3,6 +3,7 @@
 
 #include "agent/HostedServices.h"
 #include "agent/MapSteps.h"
+#include "agent/ProductSteps.h"
 #include "agent/ProviderConfigSettings.h"
 #include "agent/RegisteredProfiles.h"
 #include "agent/SoftwareIdentities.h"
@@ -16,9 +17,11 @@ namespace {
 // clang-format off: one step a line
 constexpr Build_Step<Port_Build> PORT_STEPS[] = {
     classifyChip,
+    updateCardFromFRU,
     associateNewCard,
     CreateChipInstances,
     CreatePCIDeviceInstance,
+    buildVitalProductData,
     CreatePhysicalConnectorInstances,
     insertFCPort,
     conformFCPort,
@@ -27,6 +30,8 @@ constexpr Build_Step<Port_Build> PORT_STEPS[] = {
     buildSCSIController,
     buildPortController,
     conformPortController,
+    buildTransceiver,
+    buildFlashImages,
     associatePortController,
     buildInitiatorEndpoint,
     buildPortSoftware,
@@ -105,6 +110,7 @@ std::int32_t buildAdapters(Host_Build& host) {
 // clang-format off: one step a line
 constexpr Build_Step<Host_Build> CARD_STEPS[] = {
     findFirstPort, buildProviderIdentity, buildProviderConfigSettings, startServices, buildAdapters,
+    buildVirtualPorts,
 };
 // clang-format on
 
@@ -119,7 +125,8 @@ std::int32_t buildCards(Host_Build& host) {
 // clang-format off: one step a line
 constexpr Build_Step<Host_Build> HOST_STEPS[] = {
     buildComputerSystem, findPlatformChassis, registerBaseProfiles, requireDeviceTree,
-    buildOwnChassis,     buildCards,          buildRecordLog,
+    buildOwnChassis,     buildCards,          updateSoftwareFromFRU,
+    buildRecordLog,
 };
 // clang-format on
 

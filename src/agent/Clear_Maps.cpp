@@ -1,4 +1,5 @@
 // Which maps a refresh empties, and in which order.
+#include "agent/ProductSteps.h"
 #include "agent/ProviderAgent.h"
 
 namespace cimrt {
@@ -171,6 +172,7 @@ void ProviderAgent::clearAdapterMaps() {
   TVX_LOG(TVX_DBG, "PERF: Entered clearAdapterMaps()");
   clearGroup(*this, CORE);
   clearGroup(*this, DUMP_AND_TAGGING);
+  ClearPortVirtualizationMaps(*this);
   clearGroup(*this, PHYSICAL);
   TVX_LOG(TVX_DBG, "Clearing Record Log maps");
   clearGroup(*this, RECORD_LOG);
