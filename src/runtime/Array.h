@@ -39,7 +39,8 @@ struct ArrayRep {
 };
 
 /// Untyped array: what generic code over meta data handles. Never shared; a copy is deep. Capacity
-/// is exact beyond the first eight elements. Indices are not checked.
+/// is exact beyond the first eight elements. Positions behind the end are cut to it; indices of
+/// single elements are not checked. Elements handed in may lie in the array itself.
 class Array_Base {
  public:
   explicit Array_Base(const Array_Traits* traits);
@@ -52,13 +53,14 @@ class Array_Base {
   std::size_t capacity() const noexcept { return _rep->capacity; }
   const Array_Traits* traits() const noexcept { return _rep->traits; }
 
-  void assign(const void* data, std::size_t n);
-  void reserve(std::size_t n);
+  void assign(const void* data, std::size_t n);  ///< exact capacity
+  void reserve(std::size_t n);                   ///< exact capacity, never shrinks
+  /// New elements are copies of `fill`, or all zero for element types without a constructor.
   void resize(std::size_t n, const void* fill);
   void insert(std::size_t pos, const void* data, std::size_t n);
   void prepend(const void* data, std::size_t n) { insert(0, data, n); }
   void append(const void* data, std::size_t n) { insert(size(), data, n); }
-  void remove(std::size_t pos, std::size_t n);
+  void remove(std::size_t pos, std::size_t n);  ///< does not shrink
   void clear() { remove(0, size()); }
 
   /// Index of the first equal element, or -1 (all ones). For element types without an `equal`

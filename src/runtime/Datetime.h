@@ -60,6 +60,14 @@ class Datetime {
   bool equal(const Datetime& other) const noexcept;
 
  private:
+  static void release(DatetimeRep* rep) noexcept;
+  void make_private();
+  void store(std::uint64_t usec, std::int32_t utc, std::int32_t is_timestamp);
+  bool set_interval_text(const char* text);
+  bool set_timestamp_text(const char* text);
+  void interval_ascii(char* buffer, bool prettify) const;
+  void timestamp_ascii(char* buffer, bool prettify) const;
+
   DatetimeRep* _rep;
 };
 

@@ -123,7 +123,12 @@ int get_associators(const Instance* instance, const Instance* association,
                     const String& result_class, const String& role, const String& result_role,
                     Instance** results);
 
+/// MOF-like dump. Below the first level, or with `keys_only` everywhere, only keys are shown;
+/// embedded objects and instances too unless `keys_only`.
 void print(std::FILE* stream, const Instance* instance, bool keys_only = false);
+/// Parts of it: one stored value of a scalar type up to DATETIME, and an array of such.
+void print_scalar(std::FILE* stream, Type type, const void* value);
+void print_array(std::FILE* stream, Type type, const Array_Base& array);
 
 /// Null flag of a property or array of references; null for a scalar reference or a method.
 std::uint8_t* null_flag(Instance* instance, const Meta_Feature* feature);

@@ -9,7 +9,16 @@
 namespace cimrt {
 
 /// Owns its instances and keeps them in insertion order. `find` answers the first entry that is
-/// key-equal, in constant time. Not locked: callers hold the agent's locks.
+/// key-equal, and `insert` refuses a key-equal instance, both in constant time; removing is linear.
+///
+/// Entries may be changed in place, keys too. An entry that was inserted, looked up or fetched
+/// through a non-constant map is checked again at the next look-up, so whoever fetches, changes and
+/// lets go need do nothing. Only a pointer that was kept across a look-up and is then used to
+/// change a key needs `key_changed`; forgetting it can make `find` miss the changed entry, never
+/// answer a wrong one.
+///
+/// Not locked, and the constant operations check entries too: callers hold the agent's locks for
+/// all of them.
 class Instance_Map_Base {
  public:
   static constexpr std::size_t npos = static_cast<std::size_t>(-1);
@@ -21,11 +30,13 @@ class Instance_Map_Base {
 
   const Meta_Class* meta_class() const { return _meta_class; }
   std::size_t size() const { return _instances.size(); }
-  Instance* at(std::size_t i) { return _instances[i]; }
+  /// The entry, for change in place too: its keys are checked again at the next look-up.
+  Instance* at(std::size_t i);
   const Instance* at(std::size_t i) const { return _instances[i]; }
 
   /// Index of the first entry for which `key_eq(entry, model)` holds, or `npos`.
   std::size_t find(const Instance* model) const;
+  /// The found entry itself, or null.
   Instance* lookup(const Instance* model);
   /// A clone of the found entry into `out`: 0, or 60 when not found (`out` untouched).
   std::int32_t get_instance(const Instance* model, Instance*& out) const;
@@ -40,7 +51,7 @@ class Instance_Map_Base {
   /// Destroys every entry, whatever its count.
   void clear();
 
-  /// To be called after a key property of entry `i` was changed in place.
+  /// Tells that a key of entry `i` was changed through a pointer kept across a look-up.
   void key_changed(std::size_t i);
 
  private:

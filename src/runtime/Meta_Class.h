@@ -134,27 +134,57 @@ inline const Meta_Method* as_method(const Meta_Feature* f) {
   return static_cast<const Meta_Method*>(f);
 }
 
+/// Names are compared ignoring case, everywhere. Look-ups are linear; the first match wins; null
+/// when nothing matches. Meta data is immutable: any thread may read it without a lock.
+
+/// A null repository answers null.
 const Meta_Class* find_meta_class(const Meta_Repository* repository, const char* name);
+/// First feature of that name whose flags share a bit with `mask`.
 const Meta_Feature* find_feature(const Meta_Record* record, const char* name,
                                  std::uint32_t mask = ANY_FEATURE);
 const Meta_Property* find_property(const Meta_Record* record, const char* name);
 const Meta_Reference* find_reference(const Meta_Record* record, const char* name);
 const Meta_Method* find_method(const Meta_Record* record, const char* name);
+/// True if `meta_class` is `ancestor` or descends from it, by pointer or by name: a class made at
+/// run time counts as the class it copies. Everything, null too, descends from `Instance`.
 bool is_subclass(const Meta_Class* ancestor, const Meta_Class* meta_class);
 /// By names: 0 if `sub_name` is a subclass of `super_name`, 1 if not, -1 on a null or unknown name.
 int is_subclass(const Meta_Repository* repository, const char* super_name, const char* sub_name);
+/// The class itself, one of its superclasses, or any class of its repository, by name.
 const Meta_Class* find_dependent(const Meta_Class* meta_class, const char* name);
+/// True if some feature has a bit of `mask`.
 bool has_feature(const Meta_Record* record, std::uint32_t mask);
 
+/// Counting of classes and features made at run time; static ones and null are left alone. The last
+/// `unref` destroys.
 void ref(const Meta_Feature* feature);
 void unref(const Meta_Feature* feature);
+
+/// Deep copies with count 1. The class of a reference, and the superclass, are shared and counted;
+/// the copy of a class belongs to no repository.
 Meta_Class* clone(const Meta_Class* meta_class);
+Meta_Feature* clone(const Meta_Feature* feature);
+Meta_Qualifier* clone(const Meta_Qualifier* qualifier);
+/// Frees a run-time class whatever its count, overwriting it with 0xDD first; a static one stays.
 void destroy(Meta_Class* meta_class);
+
+/// A class of count 1. Without `super`: no features, the given flags. With it: a deep copy of
+/// `super` that is not abstract, whose features are all inherited; `flags` is not used then.
 Meta_Class* create_meta_class(const char* name, const Meta_Class* super, std::uint32_t flags);
+/// A readable property of count 1, to be handed to `add_feature`. `offset` follows the layout rule.
 Meta_Property* create_property(const char* name, Type type, std::int16_t subscript,
                                std::uint32_t offset, bool key);
+/// Appends a local feature to a run-time class, which takes over its reference and grows to hold
+/// it.
+void add_feature(Meta_Class* meta_class, Meta_Feature* feature);
+/// Appends a qualifier to a run-time class or feature, which takes over its reference.
+void add_qualifier(Meta_Feature* feature, Meta_Qualifier* qualifier);
+/// Removes the named qualifiers (all, for null `names`) from a run-time class and its methods.
 void filter_qualifiers(Meta_Class* meta_class, const char* const* names, std::size_t n);
+
+/// MOF-like dump to standard output, for debugging.
 void print(const Meta_Class* meta_class, bool print_qualifiers);
+/// Deep structural comparison; counts, repositories and addresses do not matter.
 bool identical(const Meta_Class* a, const Meta_Class* b);
 
 }  // namespace cimrt

@@ -61,7 +61,7 @@ using Thread_Proc = void* (*)(void* arg);
 
 class Thread {
  public:
-  Thread();
+  Thread() = default;  ///< names no thread
   static Thread self();
   static bool equal(const Thread& a, const Thread& b);
   static int join(const Thread& thread, void*& out);
@@ -72,8 +72,8 @@ class Thread {
   static int create_detached(Thread& thread, Thread_Proc proc, void* arg);
 
  private:
-  pthread_t _id;
-  std::uint64_t _reserved;
+  pthread_t _id = 0;
+  [[maybe_unused]] std::uint64_t _reserved = 0;
 };
 
 }  // namespace cimrt
