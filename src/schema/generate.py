@@ -42,14 +42,14 @@ def generate(classes, served, maps, servings, output):
     emit_host.class_data(output, classes, set(served))
 
 
-def main():
+def main(words=None):
     parser = argparse.ArgumentParser(description=__doc__.split("\n")[0])
     here = Path(__file__).resolve().parent
     parser.add_argument("--schema", type=Path, default=here)
     parser.add_argument("--providers", type=Path, default=here.parent / "derivedObjects" / "providers.txt")
     parser.add_argument("--output", type=Path)
     parser.add_argument("--check", action="store_true")
-    arguments = parser.parse_args()
+    arguments = parser.parse_args(words)
     if not arguments.check and arguments.output is None:
         parser.error("--output or --check is needed")
     try:
