@@ -1,12 +1,12 @@
-// A hand-written provider in the place of the skeleton: typed arguments, and nothing of another class.
-#include "derivedObjects/Hand_Written_Provider.h"
-
+// A hand-written provider in the place of the skeleton: typed arguments, and nothing of another
+// class.
 #include <gtest/gtest.h>
 
 #include <string>
 
 #include "derivedObjects/Calls.h"
 #include "derivedObjects/Dispatcher.h"
+#include "derivedObjects/Hand_Written_Provider.h"
 
 namespace cimrt::test {
 namespace {
@@ -120,7 +120,8 @@ TEST_F(Hand_Written, NeverSeesAnInstanceOfAnotherClass) {
 }
 
 TEST_F(Hand_Written, NeverSeesTheRecordOfAnotherClassesMethod) {
-  const Ref<Instance> record = record_of(TVXHBA_ConcreteJob::static_meta_class, "RequestStateChange");
+  const Ref<Instance> record =
+      record_of(TVXHBA_ConcreteJob::static_meta_class, "RequestStateChange");
   EXPECT_EQ(provider(OPERATION_INVOKE_METHOD, service.get(), record.get()),
             INVOKE_METHOD_UNSUPPORTED);
 }

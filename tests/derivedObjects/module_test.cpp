@@ -54,10 +54,10 @@ TEST(Module, ExportsTheFactoriesAndTheListOfClassesAndNothingElse) {
 }
 
 TEST(Module, NeedsOnlyTheSystemsOwnLibraries) {
-  const Lines allowed = {"libc.so.6",       "libstdc++.so.6", "libgcc_s.so.1", "libm.so.6",
-                         "libpthread.so.0", "libdl.so.2",     "ld-linux-x86-64.so.2",
+  const Lines allowed = {"libc.so.6", "libstdc++.so.6", "libgcc_s.so.1", "libm.so.6",
+                         "libpthread.so.0", "libdl.so.2", "ld-linux-x86-64.so.2",
                          // What a build under a sanitizer adds.
-                         "libasan.so.8",    "libubsan.so.1",  "libtsan.so.2"};
+                         "libasan.so.8", "libubsan.so.1", "libtsan.so.2"};
   Lines needed;
   for (const std::string& line : output_of("readelf -d " TVX_MODULE)) {
     const auto open = line.find('['), close = line.find(']');
@@ -90,7 +90,7 @@ class Opened_Module : public testing::Test {
 };
 
 TEST_F(Opened_Module, AnswersTheHeadOfTheListOfItsClasses) {
-  const auto* module = symbol<const Registration*()>("cimrt_module");
+  auto* const module = symbol<const Registration*()>("cimrt_module");
   ASSERT_NE(module, nullptr);
   const Registration* record = module();
   for (std::size_t i = std::size(catalogue); i-- > 0; record = record->next) {

@@ -1,7 +1,5 @@
 // What every provider class answers on a machine without the management libraries, and the list of
 // registrations.
-#include "derivedObjects/Skeleton_Provider.h"
-
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -15,6 +13,7 @@
 #include "common/CLogger.h"
 #include "derivedObjects/Calls.h"
 #include "derivedObjects/Dispatcher.h"
+#include "derivedObjects/Skeleton_Provider.h"
 #include "schema/catalogue.h"
 
 namespace cimrt::test {
@@ -70,10 +69,9 @@ class Skeleton : public testing::Test {
 };
 
 const Provider_Entry& entry_named(const std::string& name) {
-  const auto* entry =
-      std::ranges::find_if(provider_entries, [&](const Provider_Entry& e) {
-        return e.provider_name == name + "_Provider";
-      });
+  const auto* entry = std::ranges::find_if(provider_entries, [&](const Provider_Entry& e) {
+    return e.provider_name == name + "_Provider";
+  });
   EXPECT_NE(entry, std::end(provider_entries)) << name;
   return *entry;
 }

@@ -1,10 +1,10 @@
 // The agent's maps: one for each class that has one, in a fixed order.
+#include "generated/Agent_Maps.h"
+
 #include <gtest/gtest.h>
 
 #include <algorithm>
 #include <cstdint>
-
-#include "generated/Agent_Maps.h"
 
 namespace cimrt::test {
 namespace {

@@ -49,7 +49,9 @@ TEST(Catalogue, TheProviderClassesComeFirstInTheRepositoryInTheOrderOfTheCatalog
 TEST(Catalogue, ThirtyClassesHaveMethods) {
   EXPECT_EQ(std::ranges::count_if(catalogue, [](const auto& row) { return row.methods > 0; }), 30);
   for (const Catalogue_Row& row : catalogue) {
-    if (row.is_association()) EXPECT_EQ(row.methods, 0u) << row.name;
+    if (row.is_association()) {
+      EXPECT_EQ(row.methods, 0u) << row.name;
+    }
   }
 }
 
@@ -61,7 +63,8 @@ TEST(Repository, HoldsAllFamilies) {
     EXPECT_EQ(meta_class->meta_repository, &meta_repository) << name;
     EXPECT_EQ(meta_class->refs.load(), 0u) << name;
   }
-  const std::map<std::string, int> expected = {{"TVXHBA", 152}, {"CIM", 116}, {"IBMSD", 2}, {"PG", 1}};
+  const std::map<std::string, int> expected = {
+      {"TVXHBA", 152}, {"CIM", 116}, {"IBMSD", 2}, {"PG", 1}};
   EXPECT_EQ(families, expected);
 }
 
@@ -92,8 +95,12 @@ TEST(Repository, EveryFeatureIsOfOneKindAndPropertiesAreReadable) {
     for (const Meta_Feature* feature : features_of(meta_class)) {
       SCOPED_TRACE(std::string(meta_class->name) + "." + feature->name);
       EXPECT_EQ(is_property(feature) + is_reference(feature) + is_method(feature), 1);
-      if (is_property(feature)) EXPECT_NE(feature->flags & FLAG_READ, 0u);
-      if (is_reference(feature)) EXPECT_EQ(as_reference(feature)->subscript, 0);
+      if (is_property(feature)) {
+        EXPECT_NE(feature->flags & FLAG_READ, 0u);
+      }
+      if (is_reference(feature)) {
+        EXPECT_EQ(as_reference(feature)->subscript, 0);
+      }
     }
   }
 }

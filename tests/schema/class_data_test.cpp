@@ -1,6 +1,4 @@
 // What the host programs are told of the classes is what the provider knows of them.
-#include "schema/ClassData.h"
-
 #include <gtest/gtest.h>
 
 #include <set>
@@ -9,6 +7,7 @@
 
 #include "cmpi/cmpidt.h"
 #include "runtime/Instance.h"
+#include "schema/ClassData.h"
 #include "schema/catalogue.h"
 #include "schema/meta_walk.h"
 

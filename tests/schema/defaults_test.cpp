@@ -115,7 +115,9 @@ TEST(Defaults, NoMethodParameterHasOne) {
   for (const Meta_Class* meta_class : all_classes()) {
     for (const Meta_Method* method : methods_of(meta_class)) {
       for (const Meta_Feature* parameter : features_of(method)) {
-        if (is_property(parameter)) EXPECT_EQ(as_property(parameter)->value, nullptr);
+        if (is_property(parameter)) {
+          EXPECT_EQ(as_property(parameter)->value, nullptr);
+        }
       }
     }
   }

@@ -106,8 +106,8 @@ TEST(Layout, TypedFieldsAgreeWithTheDescriptions) {
   EXPECT_EQ(num_field_offsets, described);
   for (std::size_t i = 0; i < num_field_offsets; ++i) {
     const Field_Offset& field = field_offsets[i];
-    const Meta_Feature* feature = find_feature(class_named(field.class_name), field.field,
-                                               FLAG_PROPERTY | FLAG_REFERENCE);
+    const Meta_Feature* feature =
+        find_feature(class_named(field.class_name), field.field, FLAG_PROPERTY | FLAG_REFERENCE);
     ASSERT_NE(feature, nullptr) << field.class_name << "." << field.field;
     EXPECT_EQ(field.offset, offset_of(feature)) << field.class_name << "." << field.field;
   }
@@ -125,7 +125,9 @@ TEST(Layout, ASubclassRepeatsItsSuperclassesFeaturesAtTheSamePlaces) {
       const Meta_Feature* inherited = super->meta_features[i];
       EXPECT_STREQ(own->name, inherited->name);
       EXPECT_EQ(own == inherited, meta_class->locals[i] == 0) << own->name;
-      if (!is_method(own)) EXPECT_EQ(offset_of(own), offset_of(inherited)) << own->name;
+      if (!is_method(own)) {
+        EXPECT_EQ(offset_of(own), offset_of(inherited)) << own->name;
+      }
     }
   }
 }
@@ -169,11 +171,11 @@ TEST(Keys, ComeInTheOrderOfTheClass) {
       {"TVXHBA_RecordLog", {"InstanceID"}},
       {"TVXHBA_ConcreteJob", {"InstanceID"}},
       {"TVXHBA_SoftwareIdentity", {"InstanceID"}},
-      {"TVXHBA_DumpService", {"Name", "SystemCreationClassName", "SystemName", "CreationClassName"}},
+      {"TVXHBA_DumpService",
+       {"Name", "SystemCreationClassName", "SystemName", "CreationClassName"}},
       {"TVXHBA_RemoteServiceAccessPoint",
        {"Name", "SystemCreationClassName", "SystemName", "CreationClassName"}},
-      {"TVXHBA_FCPort",
-       {"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID"}},
+      {"TVXHBA_FCPort", {"SystemCreationClassName", "SystemName", "CreationClassName", "DeviceID"}},
       {"TVXHBA_Card", {"Tag", "CreationClassName"}},
       {"TVXHBA_Product", {"Name", "IdentifyingNumber", "Vendor", "Version"}},
       {"TVXHBA_SystemDevice", {"GroupComponent", "PartComponent"}},
