@@ -1,6 +1,7 @@
 // What every entry point of both libraries goes through.
 #pragma once
 
+#include <string_view>
 #include <type_traits>
 #include <utility>
 
@@ -30,17 +31,24 @@ template <class Status, class Site, class Body>
 Status run_entry(Status error, Site&& site, const Failure_Outputs& outputs, Body&& body) noexcept {
   try {
     Simulation& simulation = Simulation::instance();
-    Fault_Effect effect;
-    if constexpr (std::is_invocable_v<Site>) {
-      effect = simulation.begin_call(site());
-    } else {
-      effect = simulation.begin_call(std::forward<Site>(site));
-    }
+    Call_Site made = [&]() -> Call_Site {
+      if constexpr (std::is_invocable_v<Site>) {
+        return site();
+      } else {
+        return std::forward<Site>(site);
+      }
+    }();
+    const std::string_view name = made.name;
+    const Fault_Effect effect = simulation.begin_call(std::move(made));
     if (effect.status) {
       write_failure(effect, outputs);
       return static_cast<Status>(*effect.status);
     }
-    return simulation.with_world([&](World& world) -> Status { return body(world, effect); });
+    return simulation.with_world([&](World& world) -> Status {
+      const Status status = body(world, effect);
+      simulation.end_call(name);
+      return status;
+    });
   } catch (...) {
     return error;
   }

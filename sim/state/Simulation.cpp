@@ -7,16 +7,24 @@
 #include <cstdlib>
 #include <thread>
 
+#include "state/Persist.h"
 #include "state/Scenario.h"
 
 namespace tvx::sim {
 namespace {
 
-constexpr const char* scenario_variable = "TVX_SIM_SCENARIO";
+std::string environment(const char* variable) {
+  const char* value = std::getenv(variable);
+  return value == nullptr ? std::string() : std::string(value);
+}
 
 std::string environment_path() {
-  const char* path = std::getenv(scenario_variable);
-  return path == nullptr ? std::string() : std::string(path);
+  return environment("TVX_SIM_SCENARIO");
+}
+
+// One line for the user; the libraries have no other way to say it.
+void complain(const std::string& message) {
+  std::fprintf(stderr, "tvxsim: %s\n", message.c_str());
 }
 
 // Tells two states of a file apart.
@@ -82,14 +90,32 @@ std::string Simulation::replace_world(const std::string& source, const std::stri
     } else {
       m_World = source.empty() ? default_scenario() : load_scenario(source);
     }
+    restore_world();
     return {};
   } catch (const std::exception& error) {
     m_World = World();
     m_World.scenario = source;
     const std::string message = source + ": " + error.what();
-    std::fprintf(stderr, "tvxsim: %s\n", message.c_str());
+    complain(message);
     return message;
   }
+}
+
+void Simulation::restore_world() {
+  m_StatePath = environment("TVX_SIM_STATE");
+  if (m_StatePath.empty()) return;
+  const std::string problem = restore_state(m_World, m_StatePath);
+  if (problem.empty()) return;
+  complain(m_StatePath + ": " + problem + "; changes are not kept");
+  m_StatePath.clear();
+}
+
+void Simulation::end_call(std::string_view name) {
+  if (m_StatePath.empty() || !changes_state(name)) return;
+  const std::string problem = save_state(m_World, m_StatePath);
+  if (problem.empty()) return;
+  complain(m_StatePath + ": " + problem + "; changes are not kept");
+  m_StatePath.clear();
 }
 
 std::string Simulation::load_file(const std::string& path) {

@@ -5,6 +5,7 @@
 #include <map>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <utility>
 
 #include "state/Fault.h"
@@ -18,6 +19,9 @@ namespace tvx::sim {
 /// built-in one. It is read at first use. A library that is loaded or initialised anew looks
 /// whether the variable or the file changed meanwhile and, if so, starts a new world. A scenario
 /// that cannot be used gives a world without adapters and one line on standard error.
+///
+/// With TVX_SIM_STATE (a path) what calls change is kept in that file, and found again by the next
+/// process that reads the scenario; for the simulated host that is a reboot.
 class Simulation {
  public:
   static Simulation& instance();
@@ -33,6 +37,10 @@ class Simulation {
   /// Counts a call and finds what faults do to it; waits out their delay, without the lock.
   /// Where the site names a local port its adapter is filled in, and the other way round.
   Fault_Effect begin_call(Call_Site site);
+
+  /// Keeps what a successful call changed, when TVX_SIM_STATE names a file. With the lock held,
+  /// from within `with_world`.
+  void end_call(std::string_view name);
 
   /// Runs `body` with the world, under the lock, and answers its result.
   template <class Body>
@@ -51,13 +59,15 @@ class Simulation {
   void ensure_world();
   std::string replace_world(const std::string& source, const std::string& text);
   void load_environment();
+  void restore_world();
 
   std::mutex m_Mutex;
   // Guarded by m_Mutex:
   World m_World;
   bool m_bLoaded = false;
   bool m_bPinned = false;
-  std::string m_Stamp;  // what the world was made from: path, size and time of the file
+  std::string m_StatePath;  // empty: changes end with the process
+  std::string m_Stamp;      // what the world was made from: path, size and time of the file
   std::map<std::string, std::map<Wwn, std::uint64_t>, std::less<>> m_Calls;
 };
 
