@@ -1,5 +1,6 @@
 #include <string>
 
+#include "state/Events.h"
 #include "state/Scenario_Parts.h"
 #include "state/Simulation.h"
 #include "tvxsim/tvxsim.h"
@@ -48,7 +49,10 @@ int tvxsim_add_fault(const char* json) {
 }
 
 void tvxsim_clear_faults(void) {
-  Simulation::instance().with_world([](World& world) { world.faults.clear(); });
+  report([] {
+    Simulation::instance().with_world([](World& world) { world.faults.clear(); });
+    return std::string();
+  });
 }
 
 unsigned long tvxsim_calls(const char* entry_point, const char* wwpn) {
@@ -67,12 +71,31 @@ void tvxsim_forget_calls(void) {
 }
 
 void tvxsim_advance(unsigned seconds) {
-  Simulation::instance().with_world([seconds](World& world) { world.advanced += seconds; });
+  report([seconds] {
+    Simulation::instance().with_world([seconds](World& world) { world.advanced += seconds; });
+    return std::string();
+  });
+}
+
+int tvxsim_post_event(const char* wwpn, unsigned type, unsigned fabric_port) {
+  int called = 0;
+  const int status = report([&] {
+    const std::optional<Wwn> port = parse_wwn(wwpn ? wwpn : "");
+    if (!port) return std::string("not a world wide name");
+    called = post_event(*port, type, fabric_port);
+    return std::string();
+  });
+  return status == 0 ? called : -1;
 }
 
 unsigned tvxsim_open_handles(void) {
-  return Simulation::instance().with_world(
-      [](const World& world) { return static_cast<unsigned>(world.handles.size()); });
+  unsigned count = 0;
+  report([&count] {
+    count = Simulation::instance().with_world(
+        [](const World& world) { return static_cast<unsigned>(world.handles.size()); });
+    return std::string();
+  });
+  return count;
 }
 
 }  // extern "C"

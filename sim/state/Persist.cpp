@@ -78,6 +78,25 @@ json oas_json(const Port& port) {
   return list;
 }
 
+json qos_json(const Qos_Store& qos) {
+  json entries = json::array();
+  for (const Qos_Entry& entry : qos.entries) {
+    entries.push_back({{"source", format_wwn(entry.source)},
+                       {"target", format_wwn(entry.target)},
+                       {"tag", entry.tag}});
+  }
+  return {{"flag", qos.flag}, {"entries", entries}};
+}
+
+void restore_qos(const json& object, Qos_Store& qos) {
+  qos.flag = object.at("flag").get<std::uint32_t>();
+  qos.entries.clear();
+  for (const json& entry : object.at("entries")) {
+    qos.entries.push_back({wwn_of(entry.at("source")), wwn_of(entry.at("target")),
+                           entry.at("tag").get<std::uint8_t>()});
+  }
+}
+
 json port_json(const Port& port) {
   json object = {{"current", names_json(port.names)},
                  {"non_volatile", names_json(port.wwns.non_volatile)},
@@ -89,7 +108,8 @@ json port_json(const Port& port) {
                  {"beacon", port.beacon},
                  {"card_values", values_json(port)},
                  {"driver_params", parameters_json(port.driver_params)},
-                 {"oas", oas_json(port)}};
+                 {"oas", oas_json(port)},
+                 {"qos", qos_json(port.qos)}};
   object["firmware"] = port.firmware.pending ? json(*port.firmware.pending) : json(nullptr);
   const auto fec = port.values.find(fec_state);
   object["fec"] = fec == port.values.end() ? json(nullptr) : json(fec->second);
@@ -140,6 +160,7 @@ void restore_port(const json& object, Port& port) {
   restore_names(object, port);
   restore_values(object, port);
   restore_lists(object, port);
+  restore_qos(object.at("qos"), port.qos);
   port.state = object.at("state").get<std::uint32_t>();
   port.beacon = object.at("beacon").get<std::uint32_t>();
   restore_parameters(object.at("driver_params"), port.driver_params);

@@ -150,6 +150,18 @@ void read_diagnostics(const Json_Reader& reader, Port& port) {
   diagnostics->finish();
 }
 
+void read_qos(const Json_Reader& reader, Qos_Store& qos) {
+  const std::optional<Json_Reader> given = reader.object("qos");
+  if (!given) return;
+  qos.flag = given->number<std::uint32_t>("flag", 0);
+  for (const Json_Reader& item : given->objects("entries")) {
+    qos.entries.push_back(
+        {item.wwn("source", {}), item.wwn("target", {}), item.number<std::uint8_t>("tag", 0)});
+    item.finish();
+  }
+  given->finish();
+}
+
 void read_features(const Json_Reader& reader, Port& port) {
   port.features = {{201, 0}, {430, 1}};
   const std::optional<Json_Reader> features = reader.object("features");
@@ -214,6 +226,7 @@ void read_port_features(const Json_Reader& reader, Port& port) {
   read_oas(reader, port);
   read_diagnostics(reader, port);
   read_features(reader, port);
+  read_qos(reader, port.qos);
   port.beacon = reader.choice("beacon", 2, {{"not available", 1}, {"off", 2}, {"on", 3}});
   port.enabled_state = port.state == 22 ? 2 : port.state;
   port.enable_needs_reset = reader.flag("enable_needs_reset", true);

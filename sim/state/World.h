@@ -132,6 +132,18 @@ struct Transceiver {
   std::array<std::uint16_t, 20> thresholds{};
 };
 
+/// A tag for the frames between two ports.
+struct Qos_Entry {
+  Wwn source{};
+  Wwn target{};
+  std::uint8_t tag = 0;
+};
+
+struct Qos_Store {
+  std::uint32_t flag = 0;
+  std::vector<Qos_Entry> entries;
+};
+
 /// The configuration registers of a port's PCI function that a scenario chooses.
 struct Pci_Function {
   std::uint32_t family = 5;
@@ -184,6 +196,7 @@ struct Port {
   std::vector<Flash_Entry> flash;
   std::map<std::uint32_t, std::uint32_t> features;
   Pci_Function pci;
+  Qos_Store qos;
   std::uint32_t resets = 0;
   std::vector<Target> targets;      ///< what lies behind the port while its link is up
   std::set<std::uint32_t> omitted;  ///< attribute numbers that this port never reports
@@ -232,6 +245,7 @@ struct World {
   std::int64_t made_at = 0;                      ///< seconds of the clock when the world was made
   std::int64_t advanced = 0;                     ///< seconds that the clock was put forward since
   std::map<std::uint32_t, std::size_t> handles;  ///< open SNIA handles, to adapter indices
+  std::map<std::uint32_t, std::size_t> qos_handles;  ///< the same of the frame tagging library
   std::uint32_t next_handle = 1;
 
   /// The port with this current port name; null when there is none.

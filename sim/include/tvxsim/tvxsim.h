@@ -37,6 +37,10 @@ void tvxsim_forget_calls(void);
 /* Puts the clock of the counters forward. */
 void tvxsim_advance(unsigned seconds);
 
+/* Calls the callbacks that were registered for events of the port, on this thread, and answers how
+ * many there were; -1 for a malformed name. */
+int tvxsim_post_event(const char* wwpn, unsigned type, unsigned fabric_port);
+
 /* SNIA handles that are open at the moment. */
 unsigned tvxsim_open_handles(void);
 
