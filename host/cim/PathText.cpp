@@ -68,6 +68,7 @@ class PathReader {
       }
       ++m_Position;
       if (path.keys.find(name) != nullptr) {
+        m_Position -= name.size() + 1;
         fail("the key " + name + " only once");
       }
       path.keys.set(name, readValue());

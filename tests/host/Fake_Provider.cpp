@@ -322,7 +322,7 @@ unsigned misbehave(const std::string& how, const CMPIContext* context) {
     CMPIValue value{};
     return CMSetProperty(instance, how == "wrong-type" ? "Color" : "Odd", &value, CMPI_uint8).rc;
   } else if (how == "wrong-kind") {
-    CMGetClassName(reinterpret_cast<CMPIObjectPath*>(string), nullptr);
+    CMNewInstance(broker, reinterpret_cast<CMPIObjectPath*>(string), nullptr);
   } else if (how == "refuse-unload") {
     refuseUnload = true;
   } else if (how == "thread") {

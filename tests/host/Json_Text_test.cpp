@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include "Test_Classes.h"
+#include "cim/PathText.h"
 
 namespace tvx::host {
 namespace {

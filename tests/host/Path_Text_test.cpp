@@ -76,7 +76,7 @@ TEST(PathTextTest, FaultsAreToldWithTheirPlace) {
   EXPECT_EQ(faultOf("X.N=\"a"), "bad object path 'X.N=\"a': expected a closing '\"' at character 7");
   EXPECT_EQ(faultOf("X.N=1;"), "bad object path 'X.N=1;': expected a text in double quotes, a number, TRUE or FALSE at character 5");
   EXPECT_EQ(faultOf("X.N=\"a\"b"), "bad object path 'X.N=\"a\"b': expected ',' or the end at character 8");
-  EXPECT_EQ(faultOf("X.N=1,n=2"), "bad object path 'X.N=1,n=2': expected the key n only once at character 8");
+  EXPECT_EQ(faultOf("X.N=1,n=2"), "bad object path 'X.N=1,n=2': expected the key n only once at character 7");
   EXPECT_NE(faultOf("X.N=18446744073709551616"), "no fault");
 }
 
