@@ -132,6 +132,7 @@ ExitCode enumerate(Session& session) {
   request.operation =
       options.command == "ein" ? Operation::EnumerateInstanceNames : Operation::EnumerateInstances;
   request.path.className = options.className;
+  request.path.nameSpace = options.nameSpace;
   request.properties = options.properties;
   printReply(session, request, session.run(request, true));
   return ExitCode::Ok;

@@ -122,7 +122,7 @@ void describeClasses(const Options& options, const ClassCatalogue& classes, std:
       json["methods"] = Json::array();
       for (const MethodData& method : methods(*each)) {
         json["methods"].push_back(methodJson(method));
-        methodLines += fmt::format("{}.{}\n", each->name, methodSignature(method));
+        methodLines += fmt::format("{}: {}\n", each->name, methodSignature(method));
       }
     }
     list.push_back(std::move(json));

@@ -140,12 +140,12 @@ std::optional<Options> parseOptions(int argc, const char* const* argv, int& exit
   Options options;
   Raw raw;
   options.program = argc > 0 ? argv[0] : "tvxcim";
+  app.fallthrough();  // commands inherit it, so that global options may follow them
   addGlobals(app, options, raw);
   addClassCommands(app, options);
   addPathCommands(app, options);
   addCommand(app, options, "ports", "table of the FC ports");
   app.require_subcommand(1);
-  app.fallthrough();
   app.footer(footer());
   try {
     app.parse(argc, argv);

@@ -14,9 +14,6 @@ BrokerOptions brokerOptions(const Options& options, const ClassCatalogue& classe
   result.version = options.brokerVersion;
   result.strict = options.strict;
   result.classes = &classes;
-  if (!options.nameSpace.empty()) {
-    result.nameSpace = options.nameSpace;
-  }
   return result;
 }
 

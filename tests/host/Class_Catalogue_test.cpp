@@ -1,8 +1,7 @@
-#include "cim/ClassCatalogue.h"
-
 #include <gtest/gtest.h>
 
 #include "Test_Classes.h"
+#include "cim/ClassCatalogue.h"
 
 namespace tvx::host {
 namespace {
@@ -31,7 +30,8 @@ TEST(ClassCatalogueTest, SubclassTestWalksTheAncestors) {
 }
 
 TEST(ClassCatalogueTest, ServedClassesBelowABaseAreSorted) {
-  EXPECT_EQ(names(test::testClasses().servedSubclasses("CIM_Thing")), (Names{"FAKE_Gadget", "FAKE_Widget"}));
+  EXPECT_EQ(names(test::testClasses().servedSubclasses("CIM_Thing")),
+            (Names{"FAKE_Gadget", "FAKE_Widget"}));
   EXPECT_EQ(names(test::testClasses().servedSubclasses("FAKE_Foreign")), Names{});
   EXPECT_EQ(names(test::testClasses().servedAssociations("")), Names{"FAKE_Link"});
   EXPECT_EQ(names(test::testClasses().servedAssociations("FAKE_Widget")), Names{});
@@ -40,7 +40,8 @@ TEST(ClassCatalogueTest, ServedClassesBelowABaseAreSorted) {
 
 TEST(ClassCatalogueTest, NearNamesComeNearestFirst) {
   EXPECT_EQ(test::testClasses().nearNames("FAKE_Wigdet").front(), "FAKE_Widget");
-  EXPECT_EQ(test::testClasses().nearNames("gadget").front(), "FAKE_Gadget") << "the prefix may be left out";
+  EXPECT_EQ(test::testClasses().nearNames("gadget").front(), "FAKE_Gadget")
+      << "the prefix may be left out";
   EXPECT_TRUE(test::testClasses().nearNames("SomethingElseAltogether").empty());
   EXPECT_EQ(nearest("ab", {"abc", "ab", "abcd", "zzzzzz"}, 2), (Names{"ab", "abc"}));
 }

@@ -19,10 +19,12 @@ TEST(DateTimeTextTest, KnowsTheTextForm) {
 TEST(DateTimeTextTest, PointsInTimeGoToMicrosecondsInUtc) {
   EXPECT_EQ(dateTimeMicroseconds("19700101000000.000000+000"), 0U);
   EXPECT_EQ(dateTimeMicroseconds("19700101010000.000007+060"), 7U);
-  EXPECT_EQ(dateTimeMicroseconds("19691231230000.000007-060"), std::nullopt) << "the date lies before 1970";
+  EXPECT_EQ(dateTimeMicroseconds("19691231230000.000007-060"), std::nullopt)
+      << "the date lies before 1970";
   EXPECT_EQ(dateTimeMicroseconds("19700101000000.000000-001"), 60000000U);
   EXPECT_EQ(dateTimeMicroseconds("20230102030405.000006+000"), 1672628645000006U);
-  EXPECT_EQ(dateTimeMicroseconds("20231302030405.000006+000"), std::nullopt) << "there is no month 13";
+  EXPECT_EQ(dateTimeMicroseconds("20231302030405.000006+000"), std::nullopt)
+      << "there is no month 13";
   EXPECT_EQ(dateTimeMicroseconds("nonsense"), std::nullopt);
 }
 

@@ -16,7 +16,9 @@ const CMPIBroker* broker = nullptr;
 bool refuseUnload = false;
 CMPIString* lateString = nullptr;
 
-CMPIStatus ok() { return CMPIStatus{CMPI_RC_OK, nullptr}; }
+CMPIStatus ok() {
+  return CMPIStatus{CMPI_RC_OK, nullptr};
+}
 CMPIStatus failed(CMPIrc rc, const char* text) {
   return CMPIStatus{rc, text == nullptr ? nullptr : CMNewString(broker, text, nullptr)};
 }
@@ -86,7 +88,9 @@ unsigned indexOf(const CMPIObjectPath* path) {
 
 // ---- Instances ----
 
-unsigned countOf(const std::string& className) { return className == "FAKE_Gadget" ? 1 : widgetCount; }
+unsigned countOf(const std::string& className) {
+  return className == "FAKE_Gadget" ? 1 : widgetCount;
+}
 
 CMPIStatus cleanupInstance(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean terminating) {
   return refuseUnload && terminating == 0 ? CMPIStatus{CMPI_RC_DO_NOT_UNLOAD, nullptr} : ok();
@@ -137,8 +141,9 @@ CMPIStatus create(CMPIInstanceMI*, const CMPIContext*, const CMPIResult* result,
   return CMReturnDone(result);
 }
 
-CMPIStatus modify(CMPIInstanceMI*, const CMPIContext*, const CMPIResult*, const CMPIObjectPath* path,
-                  const CMPIInstance* instance, const char** properties) {
+CMPIStatus modify(CMPIInstanceMI*, const CMPIContext*, const CMPIResult*,
+                  const CMPIObjectPath* path, const CMPIInstance* instance,
+                  const char** properties) {
   if (indexOf(path) >= widgetCount) {
     return failed(CMPI_RC_ERR_NOT_FOUND, nullptr);
   }
@@ -162,7 +167,9 @@ CMPIStatus query(CMPIInstanceMI*, const CMPIContext*, const CMPIResult*, const C
 
 // ---- Links: widget n to widget n + 1 ----
 
-CMPIStatus cleanupAssociation(CMPIAssociationMI*, const CMPIContext*, CMPIBoolean) { return ok(); }
+CMPIStatus cleanupAssociation(CMPIAssociationMI*, const CMPIContext*, CMPIBoolean) {
+  return ok();
+}
 
 CMPIInstance* makeLink(unsigned from) {
   CMPIObjectPath* path = CMNewObjectPath(broker, nameSpace, "FAKE_Link", nullptr);
@@ -221,9 +228,8 @@ CMPIStatus associators(CMPIAssociationMI*, const CMPIContext* context, const CMP
 
 CMPIStatus references(CMPIAssociationMI*, const CMPIContext*, const CMPIResult* result,
                       const CMPIObjectPath* source, const char*, const char* role, const char**) {
-  eachNeighbour(source, role, [&](unsigned link, unsigned) {
-    CMReturnInstance(result, makeLink(link));
-  });
+  eachNeighbour(source, role,
+                [&](unsigned link, unsigned) { CMReturnInstance(result, makeLink(link)); });
   return CMReturnDone(result);
 }
 
@@ -338,7 +344,9 @@ unsigned misbehave(const std::string& how, const CMPIContext* context) {
   return 0;
 }
 
-CMPIStatus cleanupMethod(CMPIMethodMI*, const CMPIContext*, CMPIBoolean) { return ok(); }
+CMPIStatus cleanupMethod(CMPIMethodMI*, const CMPIContext*, CMPIBoolean) {
+  return ok();
+}
 
 /// Echoes every argument's name and type, and counts one coat more.
 CMPIStatus paint(const CMPIResult* result, const CMPIArgs* in, CMPIArgs* out) {
@@ -396,7 +404,7 @@ CMPIInstanceMI* instanceInterface() {
   table.modifyInstance = modify;
   table.deleteInstance = remove;
   table.execQuery = query;
-  static CMPIInstanceMI interface{nullptr, &table};
+  static CMPIInstanceMI interface { nullptr, &table };
   return &interface;
 }
 
@@ -407,7 +415,7 @@ CMPIAssociationMI* associationInterface() {
   table.associatorNames = associatorNames;
   table.references = references;
   table.referenceNames = referenceNames;
-  static CMPIAssociationMI interface{nullptr, &table};
+  static CMPIAssociationMI interface { nullptr, &table };
   return &interface;
 }
 
@@ -415,7 +423,7 @@ CMPIMethodMI* methodInterface() {
   static CMPIMethodMIFT table{};
   table.cleanup = cleanupMethod;
   table.invokeMethod = invoke;
-  static CMPIMethodMI interface{nullptr, &table};
+  static CMPIMethodMI interface { nullptr, &table };
   return &interface;
 }
 

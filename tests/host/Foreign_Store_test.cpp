@@ -1,8 +1,7 @@
-#include "broker/ForeignStore.h"
-
 #include <gtest/gtest.h>
 
 #include "Fake_Broker.h"
+#include "broker/ForeignStore.h"
 
 namespace tvx::host {
 namespace {
@@ -46,9 +45,13 @@ TEST_F(ForeignStoreTest, KnowsItsClassesAndNamespaces) {
 }
 
 TEST_F(ForeignStoreTest, EnumeratesOneClassOfOneNamespace) {
-  EXPECT_EQ(store.answer(request(Operation::EnumerateInstances, "FAKE_Foreign")).instances.size(), 2U);
-  EXPECT_EQ(store.answer(request(Operation::EnumerateInstances, "root/else:FAKE_Foreign")).instances.size(), 0U);
-  const Reply names = store.answer(request(Operation::EnumerateInstanceNames, "root/ibmse:FAKE_Foreign"));
+  EXPECT_EQ(store.answer(request(Operation::EnumerateInstances, "FAKE_Foreign")).instances.size(),
+            2U);
+  EXPECT_EQ(store.answer(request(Operation::EnumerateInstances, "root/else:FAKE_Foreign"))
+                .instances.size(),
+            0U);
+  const Reply names =
+      store.answer(request(Operation::EnumerateInstanceNames, "root/ibmse:FAKE_Foreign"));
   ASSERT_EQ(names.paths.size(), 2U);
   EXPECT_EQ(printPath(names.paths[1]), "root/ibmse:FAKE_Foreign.Id=\"b\"");
 }
@@ -59,7 +62,8 @@ TEST_F(ForeignStoreTest, GetsOneInstanceWithAPropertyList) {
   const Reply reply = store.answer(get);
   ASSERT_EQ(reply.instances.size(), 1U);
   EXPECT_EQ(reply.instances[0].properties, (NamedValues{{"Level", Value::number(CMPI_uint16, 1)}}));
-  EXPECT_EQ(store.answer(request(Operation::GetInstance, "FAKE_Foreign.Id=\"c\"")).status.rc, CMPI_RC_ERR_NOT_FOUND);
+  EXPECT_EQ(store.answer(request(Operation::GetInstance, "FAKE_Foreign.Id=\"c\"")).status.rc,
+            CMPI_RC_ERR_NOT_FOUND);
 }
 
 TEST_F(ForeignStoreTest, InstancesAreCreatedModifiedAndDeleted) {
@@ -68,14 +72,18 @@ TEST_F(ForeignStoreTest, InstancesAreCreatedModifiedAndDeleted) {
   EXPECT_EQ(store.answer(create).paths.at(0), create.path);
   EXPECT_EQ(store.answer(create).status.rc, CMPI_RC_ERR_ALREADY_EXISTS);
   Request modify = request(Operation::ModifyInstance, "FAKE_Foreign.Id=\"c\"");
-  modify.instance.properties = {{"Level", Value::number(CMPI_uint16, 4)}, {"Id", Value::string("no")}};
+  modify.instance.properties = {{"Level", Value::number(CMPI_uint16, 4)},
+                                {"Id", Value::string("no")}};
   modify.properties = std::vector<std::string>{"Level"};
   EXPECT_EQ(store.answer(modify).status.rc, CMPI_RC_OK);
   EXPECT_EQ(store.instances("FAKE_Foreign").at(2).text("Level"), "4");
   EXPECT_FALSE(store.instances("FAKE_Foreign").at(2).has("Id"));
-  EXPECT_EQ(store.answer(request(Operation::DeleteInstance, "FAKE_Foreign.Id=\"c\"")).status.rc, CMPI_RC_OK);
-  EXPECT_EQ(store.answer(request(Operation::DeleteInstance, "FAKE_Foreign.Id=\"c\"")).status.rc, CMPI_RC_ERR_NOT_FOUND);
-  EXPECT_EQ(store.answer(request(Operation::ModifyInstance, "FAKE_Foreign.Id=\"c\"")).status.rc, CMPI_RC_ERR_NOT_FOUND);
+  EXPECT_EQ(store.answer(request(Operation::DeleteInstance, "FAKE_Foreign.Id=\"c\"")).status.rc,
+            CMPI_RC_OK);
+  EXPECT_EQ(store.answer(request(Operation::DeleteInstance, "FAKE_Foreign.Id=\"c\"")).status.rc,
+            CMPI_RC_ERR_NOT_FOUND);
+  EXPECT_EQ(store.answer(request(Operation::ModifyInstance, "FAKE_Foreign.Id=\"c\"")).status.rc,
+            CMPI_RC_ERR_NOT_FOUND);
 }
 
 TEST_F(ForeignStoreTest, MethodsAnswerAsPlanned) {
@@ -92,8 +100,10 @@ TEST_F(ForeignStoreTest, FailuresComeAsPlanned) {
   const Reply reply = store.answer(request(Operation::EnumerateInstances, "BAD_Class"));
   EXPECT_EQ(reply.status.rc, CMPI_RC_ERR_ACCESS_DENIED);
   EXPECT_EQ(reply.status.message, "keep out");
-  EXPECT_EQ(store.answer(request(Operation::EnumerateInstanceNames, "BAD_Class")).status.rc, CMPI_RC_OK);
-  EXPECT_EQ(store.answer(request(Operation::ExecQuery, "FAKE_Foreign")).status.rc, CMPI_RC_ERR_NOT_SUPPORTED);
+  EXPECT_EQ(store.answer(request(Operation::EnumerateInstanceNames, "BAD_Class")).status.rc,
+            CMPI_RC_OK);
+  EXPECT_EQ(store.answer(request(Operation::ExecQuery, "FAKE_Foreign")).status.rc,
+            CMPI_RC_ERR_NOT_SUPPORTED);
   EXPECT_EQ(store.answer(request(Operation::Associators, "FAKE_Foreign")).status.rc, CMPI_RC_OK);
 }
 
@@ -102,7 +112,8 @@ TEST_F(ForeignStoreTest, BadTextAddsNothing) {
   EXPECT_ANY_THROW(add("{")());
   EXPECT_ANY_THROW(add("[]")());
   EXPECT_ANY_THROW(add(R"({"version": 2})")());
-  EXPECT_ANY_THROW(add(R"({"version": 1, "instances": [{"class": "NEW_Class"}, {"class": "FAKE_Foreign", "properties": {"Level": -1}}]})")());
+  EXPECT_ANY_THROW(add(
+      R"({"version": 1, "instances": [{"class": "NEW_Class"}, {"class": "FAKE_Foreign", "properties": {"Level": -1}}]})")());
   EXPECT_FALSE(store.knowsClass("NEW_Class"));
 }
 

@@ -160,7 +160,8 @@ TEST_F(ObjectsTest, PathsKeepPlaceClassAndKeys) {
   CMPIString* name = nullptr;
   EXPECT_EQ(CMGetKeyAt(op, 1, &name, nullptr).value.uint32, 3U);
   EXPECT_EQ(text(name), "Number");
-  EXPECT_EQ(text(op->ft->toString(op, nullptr)), "//host/root/else:FAKE_Gadget.Name=\"a\",Number=3");
+  EXPECT_EQ(text(op->ft->toString(op, nullptr)),
+            "//host/root/else:FAKE_Gadget.Name=\"a\",Number=3");
 }
 
 TEST_F(ObjectsTest, PathsAnswerMissingKeysAndBadTypes) {
@@ -230,7 +231,8 @@ TEST_F(ObjectsTest, PropertyTypesAreCheckedAgainstTheClass) {
   CMPIValue value{};
   EXPECT_EQ(CMSetProperty(inst, "Color", &value, CMPI_uint8).rc, CMPI_RC_ERR_TYPE_MISMATCH);
   EXPECT_EQ(CMSetProperty(inst, "Sizes", &value, CMPI_uint16).rc, CMPI_RC_ERR_TYPE_MISMATCH);
-  EXPECT_EQ(CMSetProperty(inst, "Odd", &value, CMPI_uint8).rc, CMPI_RC_OK) << "unknown names are let through";
+  EXPECT_EQ(CMSetProperty(inst, "Odd", &value, CMPI_uint8).rc, CMPI_RC_OK)
+      << "unknown names are let through";
   EXPECT_EQ(CMSetProperty(inst, nullptr, &value, CMPI_uint8).rc, CMPI_RC_ERR_INVALID_PARAMETER);
   EXPECT_EQ(CMSetProperty(inst, "Color", &value, CMPI_args).rc, CMPI_RC_ERR_INVALID_DATA_TYPE);
   const auto complaints = m_Broker.permanentReport().complaints;
@@ -277,7 +279,9 @@ TEST_F(ObjectsTest, PathAndOriginCanBeSet) {
   CMPIInstance* inst = instance();
   EXPECT_EQ(inst->ft->setObjectPath(inst, path("FAKE_Gadget")).rc, CMPI_RC_OK);
   EXPECT_EQ(text(CMGetClassName(CMGetObjectPath(inst, nullptr), nullptr)), "FAKE_Gadget");
-  EXPECT_EQ(inst->ft->setPropertyWithOrigin(inst, "Color", chars("red"), CMPI_chars, "CIM_Thing").rc, CMPI_RC_OK);
+  EXPECT_EQ(
+      inst->ft->setPropertyWithOrigin(inst, "Color", chars("red"), CMPI_chars, "CIM_Thing").rc,
+      CMPI_RC_OK);
   EXPECT_EQ(text(CMGetProperty(inst, "Color", nullptr).value.string), "red");
   CMPIInstance* clone = CMClone(inst, nullptr);
   CMSetProperty(inst, "Color", chars("blue"), CMPI_chars);
@@ -306,15 +310,20 @@ TEST_P(ScalarTest, ComesBackAsItWentIn) {
   EXPECT_EQ(data.value.uint64, GetParam().bits);
 }
 
-INSTANTIATE_TEST_SUITE_P(
-    AllTypes, ScalarTest,
-    ::testing::Values(ScalarRow{"boolean", CMPI_boolean, 1}, ScalarRow{"char16", CMPI_char16, 0xABCD},
-                      ScalarRow{"uint8", CMPI_uint8, 0xFE}, ScalarRow{"uint16", CMPI_uint16, 0xFEDC},
-                      ScalarRow{"uint32", CMPI_uint32, 0xFEDCBA98}, ScalarRow{"uint64", CMPI_uint64, 0xFEDCBA9876543210},
-                      ScalarRow{"sint8", CMPI_sint8, 0x80}, ScalarRow{"sint16", CMPI_sint16, 0x8000},
-                      ScalarRow{"sint32", CMPI_sint32, 0x80000000}, ScalarRow{"sint64", CMPI_sint64, 0x8000000000000000},
-                      ScalarRow{"real32", CMPI_real32, 0x3FC00000}, ScalarRow{"real64", CMPI_real64, 0x3FF8000000000000}),
-    [](const auto& row) { return std::string(row.param.name); });
+INSTANTIATE_TEST_SUITE_P(AllTypes, ScalarTest,
+                         ::testing::Values(ScalarRow{"boolean", CMPI_boolean, 1},
+                                           ScalarRow{"char16", CMPI_char16, 0xABCD},
+                                           ScalarRow{"uint8", CMPI_uint8, 0xFE},
+                                           ScalarRow{"uint16", CMPI_uint16, 0xFEDC},
+                                           ScalarRow{"uint32", CMPI_uint32, 0xFEDCBA98},
+                                           ScalarRow{"uint64", CMPI_uint64, 0xFEDCBA9876543210},
+                                           ScalarRow{"sint8", CMPI_sint8, 0x80},
+                                           ScalarRow{"sint16", CMPI_sint16, 0x8000},
+                                           ScalarRow{"sint32", CMPI_sint32, 0x80000000},
+                                           ScalarRow{"sint64", CMPI_sint64, 0x8000000000000000},
+                                           ScalarRow{"real32", CMPI_real32, 0x3FC00000},
+                                           ScalarRow{"real64", CMPI_real64, 0x3FF8000000000000}),
+                         [](const auto& row) { return std::string(row.param.name); });
 
 TEST_F(ObjectsTest, ArgumentsHoldObjectsAndNulls) {
   CMPIArgs* args = CMNewArgs(mb, nullptr);
@@ -391,7 +400,8 @@ TEST_F(ObjectsTest, ObjectsTellTheirTypeAndText) {
   EXPECT_EQ(text(mb->eft->toString(mb, string, nullptr)), "x");
   EXPECT_EQ(text(mb->eft->toString(mb, instance(), nullptr)), "instance of FAKE_Widget");
   EXPECT_EQ(text(mb->eft->toString(mb, CMNewArgs(mb, nullptr), nullptr)), "CMPIArgs");
-  EXPECT_EQ(text(mb->eft->toString(mb, CMNewDateTimeFromBinary(mb, 0, 1, nullptr), nullptr)), "00000000000000.000000:000");
+  EXPECT_EQ(text(mb->eft->toString(mb, CMNewDateTimeFromBinary(mb, 0, 1, nullptr), nullptr)),
+            "00000000000000.000000:000");
   CMPIStatus rc{};
   EXPECT_EQ(mb->eft->toString(mb, nullptr, &rc), nullptr);
   EXPECT_EQ(rc.rc, CMPI_RC_ERR_INVALID_HANDLE);
@@ -412,7 +422,8 @@ TEST_F(ObjectsTest, MessagesAndLogLines) {
   EXPECT_EQ(text(mb->eft->getMessage(mb, "id", "the default", &rc, 0)), "the default");
   mb->eft->logMessage(mb, 3, "ID7", "a text", nullptr);
   mb->eft->trace(mb, 1, "part", nullptr, CMNewString(mb, "from a string", nullptr));
-  EXPECT_EQ(m_Broker.logLines(), (std::vector<std::string>{"log 3 ID7: a text", "trace 1 part: from a string"}));
+  EXPECT_EQ(m_Broker.logLines(),
+            (std::vector<std::string>{"log 3 ID7: a text", "trace 1 part: from a string"}));
   EXPECT_EQ(mb->eft->newCMPIError(mb, "o", "i", "m", 0, 0, 0, &rc), nullptr);
   EXPECT_EQ(rc.rc, CMPI_RC_ERR_NOT_SUPPORTED);
 }

@@ -26,11 +26,13 @@ TEST(LoadTest, AMissingLibraryIsNamed) {
 TEST(LoadTest, FactoriesAreFoundInBothForms) {
   FakeBroker broker;
   EXPECT_TRUE(broker.hasInterface("FAKE_Widget", InterfaceKind::Instance));
-  EXPECT_TRUE(broker.hasInterface("FAKE_Gadget", InterfaceKind::Instance)) << "the short form of the name";
+  EXPECT_TRUE(broker.hasInterface("FAKE_Gadget", InterfaceKind::Instance))
+      << "the short form of the name";
   EXPECT_FALSE(broker.hasInterface("FAKE_Gadget", InterfaceKind::Method));
   EXPECT_FALSE(broker.hasInterface("FAKE_Widget", InterfaceKind::Association));
   EXPECT_NE(broker.interface("FAKE_Widget", InterfaceKind::Method), nullptr);
-  EXPECT_EQ(broker.interface("FAKE_Widget", InterfaceKind::Method), broker.interface("fake_widget", InterfaceKind::Method));
+  EXPECT_EQ(broker.interface("FAKE_Widget", InterfaceKind::Method),
+            broker.interface("fake_widget", InterfaceKind::Method));
 }
 
 TEST(LoadTest, AFactoryThatFailsGivesNoInterface) {
@@ -55,7 +57,8 @@ TEST(LoadTest, UnloadClosesAndTheLibraryLoadsAgain) {
 TEST(LoadTest, AProviderMayRefuseToBeUnloadedUntilTheEnd) {
   FakeBroker broker;
   broker.misbehave("refuse-unload");
-  EXPECT_EQ(broker.cleanup("FAKE_Widget", InterfaceKind::Instance, false).rc, CMPI_RC_DO_NOT_UNLOAD);
+  EXPECT_EQ(broker.cleanup("FAKE_Widget", InterfaceKind::Instance, false).rc,
+            CMPI_RC_DO_NOT_UNLOAD);
   EXPECT_EQ(broker.unload(false).rc, CMPI_RC_DO_NOT_UNLOAD);
   EXPECT_TRUE(broker.isLoaded());
   EXPECT_TRUE(broker.unload(true).ok());
@@ -64,7 +67,8 @@ TEST(LoadTest, AProviderMayRefuseToBeUnloadedUntilTheEnd) {
 
 TEST(LoadTest, CleanupOfAnInterfaceThatIsNotInUseIsToldSo) {
   FakeBroker broker;
-  EXPECT_EQ(broker.cleanup("FAKE_Widget", InterfaceKind::Instance, false).rc, CMPI_RC_ERR_NOT_FOUND);
+  EXPECT_EQ(broker.cleanup("FAKE_Widget", InterfaceKind::Instance, false).rc,
+            CMPI_RC_ERR_NOT_FOUND);
   broker.interface("FAKE_Widget", InterfaceKind::Instance);
   EXPECT_TRUE(broker.cleanup("FAKE_Widget", InterfaceKind::Instance, false).ok());
 }
@@ -98,7 +102,8 @@ TEST(RequestTest, InstancesComeBackTyped) {
   const Reply one = broker.getInstance(broker.widget(2));
   ASSERT_EQ(one.instances.size(), 1U);
   EXPECT_EQ(one.instances[0].property("Number"), Value::number(CMPI_uint32, 2));
-  EXPECT_EQ(one.instances[0].property("Sizes").asUnsignedList(), (std::vector<std::uint64_t>{10, 20}));
+  EXPECT_EQ(one.instances[0].property("Sizes").asUnsignedList(),
+            (std::vector<std::uint64_t>{10, 20}));
   EXPECT_EQ(one.instances[0].path, broker.widget(2));
 }
 
@@ -106,7 +111,10 @@ TEST(RequestTest, ThePropertyListReachesTheProvider) {
   FakeBroker broker;
   const Reply reply = broker.getInstance(broker.widget(0), std::vector<std::string>{"Color"});
   EXPECT_EQ(reply.instances.at(0).properties, (NamedValues{{"Color", Value::string("red")}}));
-  EXPECT_EQ(broker.getInstance(broker.widget(0), std::vector<std::string>{}).instances.at(0).properties.size(), 0U);
+  EXPECT_EQ(broker.getInstance(broker.widget(0), std::vector<std::string>{})
+                .instances.at(0)
+                .properties.size(),
+            0U);
 }
 
 TEST(RequestTest, ErrorsCarryTheProvidersMessage) {
@@ -121,14 +129,19 @@ TEST(RequestTest, ErrorsCarryTheProvidersMessage) {
 TEST(RequestTest, UnknownClassesAndNamespacesDoNotReachAProvider) {
   FakeBroker broker;
   EXPECT_EQ(broker.enumerateInstances("FAKE_Nothing").status.rc, CMPI_RC_ERR_INVALID_CLASS);
-  EXPECT_EQ(broker.getInstance(broker.path("root/else:FAKE_Widget.Name=\"a\"")).status.rc, CMPI_RC_ERR_INVALID_NAMESPACE);
-  EXPECT_EQ(broker.associators(broker.widget(0), "FAKE_NoLink").status.rc, CMPI_RC_ERR_INVALID_CLASS);
+  EXPECT_EQ(broker.getInstance(broker.path("root/else:FAKE_Widget.Name=\"a\"")).status.rc,
+            CMPI_RC_ERR_INVALID_NAMESPACE);
+  EXPECT_EQ(broker.associators(broker.widget(0), "FAKE_NoLink").status.rc,
+            CMPI_RC_ERR_INVALID_CLASS);
 }
 
 TEST(RequestTest, CreateModifyAndDeleteGoThrough) {
   FakeBroker broker;
   Instance instance;
-  instance.path = {"", "root/fake", "FAKE_Widget", {{"Name", Value::string("new")}, {"Number", Value::number(CMPI_uint32, 9)}}};
+  instance.path = {"",
+                   "root/fake",
+                   "FAKE_Widget",
+                   {{"Name", Value::string("new")}, {"Number", Value::number(CMPI_uint32, 9)}}};
   instance.properties = instance.path.keys;
   EXPECT_EQ(broker.createInstance(instance).paths.at(0), instance.path);
   instance.properties.set("Name", Value::string("widget0"));
@@ -143,22 +156,28 @@ TEST(RequestTest, CreateModifyAndDeleteGoThrough) {
 
 TEST(RequestTest, MethodsTakeAndGiveArguments) {
   FakeBroker broker;
-  const Reply reply = broker.invokeMethod(
-      broker.widget(0), "Paint",
-      {{"Color", Value::string("none")}, {"Coats", Value::number(CMPI_uint16, 2)}, {"Target", Value::reference(broker.widget(1))}});
+  const Reply reply = broker.invokeMethod(broker.widget(0), "Paint",
+                                          {{"Color", Value::string("none")},
+                                           {"Coats", Value::number(CMPI_uint16, 2)},
+                                           {"Target", Value::reference(broker.widget(1))}});
   EXPECT_TRUE(reply.status.ok());
   EXPECT_EQ(reply.returnValue, Value::number(CMPI_uint32, 5));
   EXPECT_EQ(reply.outputs.find("Coats")->asUnsigned(), 3U);
-  EXPECT_EQ(reply.outputs.find("Log")->asTextList(), (std::vector<std::string>{"Color:5632", "Coats:144", "Target:4352"}));
-  EXPECT_EQ(broker.invokeMethod(broker.widget(0), "Polish").status.rc, CMPI_RC_ERR_METHOD_NOT_FOUND);
+  EXPECT_EQ(reply.outputs.find("Log")->asTextList(),
+            (std::vector<std::string>{"Color:5632", "Coats:144", "Target:4352"}));
+  EXPECT_EQ(broker.invokeMethod(broker.widget(0), "Polish").status.rc,
+            CMPI_RC_ERR_METHOD_NOT_FOUND);
 }
 
 TEST(RequestTest, WalksAskEveryAssociationClass) {
   FakeBroker broker;
-  EXPECT_EQ(broker.associatorNames(broker.widget(1)).paths, (std::vector<ObjectPath>{broker.widget(0), broker.widget(2)}));
+  EXPECT_EQ(broker.associatorNames(broker.widget(1)).paths,
+            (std::vector<ObjectPath>{broker.widget(0), broker.widget(2)}));
   EXPECT_EQ(broker.associatorNames(broker.widget(1), "FAKE_Link", "FAKE_Gadget").paths.size(), 0U);
-  EXPECT_EQ(broker.associatorNames(broker.widget(1), "FAKE_Link", "", "Antecedent").paths, std::vector<ObjectPath>{broker.widget(2)});
-  const Reply far = broker.associators(broker.widget(0), "", "", "", "", std::vector<std::string>{"Color"});
+  EXPECT_EQ(broker.associatorNames(broker.widget(1), "FAKE_Link", "", "Antecedent").paths,
+            std::vector<ObjectPath>{broker.widget(2)});
+  const Reply far =
+      broker.associators(broker.widget(0), "", "", "", "", std::vector<std::string>{"Color"});
   ASSERT_EQ(far.instances.size(), 1U) << "the far end comes by an up-call";
   EXPECT_EQ(far.instances[0].properties, (NamedValues{{"Color", Value::string("blue")}}));
   EXPECT_EQ(broker.references(broker.widget(1)).instances.size(), 2U);
@@ -170,7 +189,8 @@ TEST(RequestTest, WalksAskEveryAssociationClass) {
 TEST(RequestTest, ForeignInstancesAreServedToo) {
   FakeBroker broker;
   EXPECT_EQ(broker.enumerateInstances("FAKE_Foreign").instances.size(), 0U);
-  broker.addForeign(R"({"version": 1, "instances": [{"class": "FAKE_Foreign", "properties": {"Id": "a"}}]})");
+  broker.addForeign(
+      R"({"version": 1, "instances": [{"class": "FAKE_Foreign", "properties": {"Id": "a"}}]})");
   EXPECT_EQ(broker.enumerateInstances("FAKE_Foreign").instances.size(), 1U);
   EXPECT_EQ(broker.enumerateInstances("CIM_Thing").instances.size(), 5U);
   EXPECT_EQ(broker.getInstance(broker.path("FAKE_Foreign.Id=\"a\"")).instances.size(), 1U);
@@ -187,9 +207,14 @@ TEST(RequestTest, IndicationsAreCollected) {
 
 TEST(WideKeysTest, IntegerKeysTakeTheWidthThatServersHandOut) {
   ObjectPath inner{"", "", "X", {{"N", Value::number(CMPI_uint16, 7)}}};
-  const ObjectPath path{"", "", "X",
-                        {{"A", Value::number(CMPI_uint16, 7)}, {"B", Value::signedNumber(CMPI_sint8, -7)},
-                         {"C", Value::string("c")}, {"D", Value::reference(inner)}, {"E", Value::boolean(true)}}};
+  const ObjectPath path{"",
+                        "",
+                        "X",
+                        {{"A", Value::number(CMPI_uint16, 7)},
+                         {"B", Value::signedNumber(CMPI_sint8, -7)},
+                         {"C", Value::string("c")},
+                         {"D", Value::reference(inner)},
+                         {"E", Value::boolean(true)}}};
   const ObjectPath usual = withWideKeys(path, 200);
   EXPECT_EQ(usual.key("A"), Value::signedNumber(CMPI_sint64, 7));
   EXPECT_EQ(usual.key("B"), Value::signedNumber(CMPI_sint64, -7));
@@ -212,15 +237,19 @@ struct Seen {
 };
 Seen seen;
 
-CMPIStatus lookAround(CMPIInstanceMI*, const CMPIContext* context, const CMPIResult* result, const CMPIObjectPath*) {
+CMPIStatus lookAround(CMPIInstanceMI*, const CMPIContext* context, const CMPIResult* result,
+                      const CMPIObjectPath*) {
   CMPIStatus rc{};
   seen = {};
   seen.count = context->ft->getEntryCount(context, nullptr);
   for (CMPICount i = 0; i < seen.count; ++i) {
     CMPIString* name = nullptr;
     const CMPIData data = context->ft->getEntryAt(context, i, &name, nullptr);
-    const char* text = data.type == CMPI_string ? CMGetCharsPtr(data.value.string, nullptr) : nullptr;
-    seen.entries.set(CMGetCharsPtr(name, nullptr), text == nullptr ? Value::number(CMPI_uint32, data.value.uint32) : Value::string(text));
+    const char* text =
+        data.type == CMPI_string ? CMGetCharsPtr(data.value.string, nullptr) : nullptr;
+    seen.entries.set(
+        CMGetCharsPtr(name, nullptr),
+        text == nullptr ? Value::number(CMPI_uint32, data.value.uint32) : Value::string(text));
   }
   CMGetContextEntry(context, "Nothing", &rc);
   seen.missing = rc.rc;
@@ -235,13 +264,15 @@ CMPIStatus lookAround(CMPIInstanceMI*, const CMPIContext* context, const CMPIRes
   return CMReturnDone(result);
 }
 
-CMPIStatus noCleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean) { return {CMPI_RC_OK, nullptr}; }
+CMPIStatus noCleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean) {
+  return {CMPI_RC_OK, nullptr};
+}
 
 CMPIInstanceMI* lookingProvider(const CMPIBroker*, const CMPIContext*, CMPIStatus*) {
   static CMPIInstanceMIFT table{};
   table.cleanup = noCleanup;
   table.enumerateInstanceNames = lookAround;
-  static CMPIInstanceMI interface{nullptr, &table};
+  static CMPIInstanceMI interface { nullptr, &table };
   return &interface;
 }
 

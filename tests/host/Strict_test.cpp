@@ -25,7 +25,8 @@ TEST(StrictDeathTest, UseAfterReleaseAborts) {
 
 TEST(StrictDeathTest, AnObjectOfAnotherKindAborts) {
   FakeBroker broker(true);
-  EXPECT_DEATH(broker.misbehave("wrong-kind"), "newInstance: a CMPIString was passed where a CMPIObjectPath is expected");
+  EXPECT_DEATH(broker.misbehave("wrong-kind"),
+               "newInstance: a CMPIString was passed where a CMPIObjectPath is expected");
 }
 
 TEST(StrictTest, WithoutItAnObjectOfAnotherKindIsRefused) {
@@ -39,9 +40,9 @@ TEST(StrictTest, AReleaseAfterTheRequestIsNoted) {
   EXPECT_EQ(kept.report.leftBehind[stringKind], 1U);
   EXPECT_TRUE(broker.lateNotes().empty());
   broker.misbehave("release-kept");
-  EXPECT_EQ(broker.lateNotes(),
-            (std::vector<std::string>{"CMPIString made by \"invokeMethod FAKE_Widget\" was released "
-                                      "after the end of its request"}));
+  EXPECT_EQ(broker.lateNotes(), (std::vector<std::string>{
+                                    "CMPIString made by \"invokeMethod FAKE_Widget\" was released "
+                                    "after the end of its request"}));
 }
 
 TEST(StrictTest, AClonedObjectThatStaysIsALeak) {
@@ -49,7 +50,8 @@ TEST(StrictTest, AClonedObjectThatStaysIsALeak) {
   const Reply leaked = broker.misbehave("leak-clone");
   EXPECT_TRUE(leaked.report.leaks());
   EXPECT_EQ(leaked.report.leakedClones[stringKind], 1U);
-  EXPECT_NE(leaked.report.text().find("invokeMethod FAKE_Widget: 1 cloned CMPIString leaked"), std::string::npos);
+  EXPECT_NE(leaked.report.text().find("invokeMethod FAKE_Widget: 1 cloned CMPIString leaked"),
+            std::string::npos);
   const Reply clean = broker.misbehave("release-clone");
   EXPECT_FALSE(clean.report.leaks());
   EXPECT_EQ(clean.report.cloned[stringKind], 1U);

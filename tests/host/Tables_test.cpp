@@ -86,7 +86,9 @@ CMPI_THREAD_RETURN addOne(void* number) {
 }
 
 int onceCount = 0;
-void countOnce() { ++onceCount; }
+void countOnce() {
+  ++onceCount;
+}
 
 TEST(ThreadTableTest, ThreadsRunAndAreJoined) {
   const Broker broker;

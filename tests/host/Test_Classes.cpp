@@ -43,10 +43,10 @@ constexpr FeatureData linkFeatures[] = {reference("Antecedent", "FAKE_Widget", t
                                         property("Strength", CMPI_uint8, "FAKE_Link")};
 
 constexpr FeatureData foreignFeatures[] = {
-    key("Id", CMPI_string, "FAKE_Foreign"), property("Level", CMPI_uint16, "FAKE_Foreign"),
+    key("Id", CMPI_string, "FAKE_Foreign"),
+    property("Level", CMPI_uint16, "FAKE_Foreign"),
     property("Levels", CMPI_sint8, "FAKE_Foreign", true),
-    {"Widget", CMPI_ref, false, false, true, false, false, "FAKE_Widget", nullptr,
-     "FAKE_Foreign"}};
+    {"Widget", CMPI_ref, false, false, true, false, false, "FAKE_Widget", nullptr, "FAKE_Foreign"}};
 
 constexpr FeatureData paintParameters[] = {
     parameter("Color", CMPI_string, false, true, false),
@@ -66,10 +66,9 @@ constexpr FeatureData paintParameters[] = {
 
 constexpr FeatureData misbehaveParameters[] = {parameter("How", CMPI_string, false, true, false)};
 
-constexpr MethodData widgetMethods[] = {{"Paint", CMPI_uint32, paintParameters,
-                                         std::size(paintParameters), "FAKE_Widget"},
-                                        {"Misbehave", CMPI_uint32, misbehaveParameters,
-                                         std::size(misbehaveParameters), "FAKE_Widget"}};
+constexpr MethodData widgetMethods[] = {
+    {"Paint", CMPI_uint32, paintParameters, std::size(paintParameters), "FAKE_Widget"},
+    {"Misbehave", CMPI_uint32, misbehaveParameters, std::size(misbehaveParameters), "FAKE_Widget"}};
 
 constexpr ClassData classOf(const char* name, const char* super, bool association,
                             const char* nameSpace, const FeatureData* features,

@@ -43,14 +43,17 @@ TEST(UpCallsTest, AnUnservedClassIsEmptyAndAnUnknownOneAnError) {
 
 TEST(UpCallsTest, AThreadThatIsNotAttachedIsRefusedAndNoted) {
   FakeBroker broker(true);
-  EXPECT_EQ(broker.misbehave("unattached").returnValue.asUnsigned(), static_cast<unsigned>(CMPI_RC_ERR_FAILED));
-  EXPECT_EQ(broker.lateNotes(),
-            std::vector<std::string>{"enumerateInstances was called on a thread that is not attached"});
+  EXPECT_EQ(broker.misbehave("unattached").returnValue.asUnsigned(),
+            static_cast<unsigned>(CMPI_RC_ERR_FAILED));
+  EXPECT_EQ(
+      broker.lateNotes(),
+      std::vector<std::string>{"enumerateInstances was called on a thread that is not attached"});
 }
 
 TEST(UpCallsTest, PlannedFailuresReachTheProvider) {
   FakeBroker broker;
-  broker.addForeign(R"({"version": 1, "failures": [{"class": "FAKE_Foreign", "operation": "enumerateInstances", "rc": 6}]})");
+  broker.addForeign(
+      R"({"version": 1, "failures": [{"class": "FAKE_Foreign", "operation": "enumerateInstances", "rc": 6}]})");
   EXPECT_EQ(broker.misbehave("thread").returnValue.asUnsigned(), 1006U);
 }
 
@@ -83,16 +86,19 @@ class UpCallTableTest : public ::testing::Test {
   CMPIStatus rc{};
 
  private:
-  static CMPIStatus run(CMPIInstanceMI*, const CMPIContext* context, const CMPIResult*, const CMPIObjectPath*) {
+  static CMPIStatus run(CMPIInstanceMI*, const CMPIContext* context, const CMPIResult*,
+                        const CMPIObjectPath*) {
     current->m_Body(context);
     return {CMPI_RC_OK, nullptr};
   }
-  static CMPIStatus cleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean) { return {CMPI_RC_OK, nullptr}; }
+  static CMPIStatus cleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean) {
+    return {CMPI_RC_OK, nullptr};
+  }
   static CMPIInstanceMI* runner(const CMPIBroker*, const CMPIContext*, CMPIStatus*) {
     static CMPIInstanceMIFT table{};
     table.cleanup = cleanup;
     table.enumerateInstanceNames = run;
-    static CMPIInstanceMI interface{nullptr, &table};
+    static CMPIInstanceMI interface { nullptr, &table };
     return &interface;
   }
 
@@ -113,7 +119,8 @@ TEST_F(UpCallTableTest, InstancesAreReadCreatedChangedAndDeleted) {
     EXPECT_NE(mb->bft->createInstance(mb, ctx, foreign("b"), made, &rc), nullptr);
     CMPIValue value{};
     value.uint16 = 5;
-    EXPECT_EQ(mb->bft->setProperty(mb, ctx, foreign("b"), "Level", &value, CMPI_uint16).rc, CMPI_RC_OK);
+    EXPECT_EQ(mb->bft->setProperty(mb, ctx, foreign("b"), "Level", &value, CMPI_uint16).rc,
+              CMPI_RC_OK);
     EXPECT_EQ(mb->bft->getProperty(mb, ctx, foreign("b"), "Level", &rc).value.uint16, 5);
     made->ft->setProperty(made, "Level", nullptr, CMPI_uint16);
     EXPECT_EQ(mb->bft->modifyInstance(mb, ctx, foreign("b"), made, nullptr).rc, CMPI_RC_OK);
@@ -159,10 +166,15 @@ TEST_F(UpCallTableTest, WalksReachTheAssociations) {
       }
       return count;
     };
-    EXPECT_EQ(countOf(mb->bft->associators(mb, ctx, source, nullptr, nullptr, nullptr, nullptr, nullptr, &rc)), 1U);
-    EXPECT_EQ(countOf(mb->bft->associatorNames(mb, ctx, source, "FAKE_Link", nullptr, "Dependent", nullptr, &rc)), 0U);
+    EXPECT_EQ(countOf(mb->bft->associators(mb, ctx, source, nullptr, nullptr, nullptr, nullptr,
+                                           nullptr, &rc)),
+              1U);
+    EXPECT_EQ(countOf(mb->bft->associatorNames(mb, ctx, source, "FAKE_Link", nullptr, "Dependent",
+                                               nullptr, &rc)),
+              0U);
     EXPECT_EQ(countOf(mb->bft->references(mb, ctx, source, nullptr, nullptr, nullptr, &rc)), 1U);
-    EXPECT_EQ(countOf(mb->bft->referenceNames(mb, ctx, source, "FAKE_Link", "Antecedent", &rc)), 1U);
+    EXPECT_EQ(countOf(mb->bft->referenceNames(mb, ctx, source, "FAKE_Link", "Antecedent", &rc)),
+              1U);
   });
 }
 
@@ -174,7 +186,9 @@ TEST_F(UpCallTableTest, MethodsAnswerReturnValueAndOutputs) {
     EXPECT_EQ(rc.rc, CMPI_RC_OK);
     EXPECT_EQ(data.value.uint32, 8U);
     EXPECT_EQ(out->ft->getArgCount(out, nullptr), 1U);
-    EXPECT_NE(mb->bft->invokeMethod(mb, ctx, foreign("a"), "Stay", in, out, &rc).state & CMPI_nullValue, 0);
+    EXPECT_NE(
+        mb->bft->invokeMethod(mb, ctx, foreign("a"), "Stay", in, out, &rc).state & CMPI_nullValue,
+        0);
     EXPECT_EQ(rc.rc, CMPI_RC_ERR_METHOD_NOT_FOUND);
   });
 }
@@ -186,7 +200,8 @@ TEST_F(UpCallTableTest, AttachNeedsAPreparedContext) {
     EXPECT_EQ(mb->bft->prepareAttachThread(mb, nullptr), nullptr);
     const CMPIContext* prepared = mb->bft->prepareAttachThread(mb, ctx);
     EXPECT_EQ(broker.openAttachments(), 1U);
-    EXPECT_EQ(mb->bft->detachThread(mb, prepared).rc, CMPI_RC_ERR_FAILED) << "it was never attached";
+    EXPECT_EQ(mb->bft->detachThread(mb, prepared).rc, CMPI_RC_ERR_FAILED)
+        << "it was never attached";
     EXPECT_EQ(broker.openAttachments(), 0U);
   });
 }

@@ -7,7 +7,9 @@
 namespace tvx::host {
 namespace {
 
-ObjectPath pathOf(const std::string& name) { return {"", "root/fake", "FAKE_Widget", {{"Name", Value::string(name)}}}; }
+ObjectPath pathOf(const std::string& name) {
+  return {"", "root/fake", "FAKE_Widget", {{"Name", Value::string(name)}}};
+}
 
 TEST(ValueTest, NumbersAreCutToTheWidthOfTheirType) {
   EXPECT_EQ(Value::number(CMPI_uint8, 0x1FF).asUnsigned(), 0xFFU);
@@ -53,7 +55,8 @@ TEST(ValueTest, EqualityLooksAtTypeNullAndContents) {
 }
 
 TEST(ValueTest, ListsAreReadAsAWhole) {
-  const Value list = Value::array(CMPI_uint16, {Value::number(CMPI_uint16, 1), Value::number(CMPI_uint16, 2)});
+  const Value list =
+      Value::array(CMPI_uint16, {Value::number(CMPI_uint16, 1), Value::number(CMPI_uint16, 2)});
   EXPECT_TRUE(list.isArray());
   EXPECT_EQ(list.elementType(), CMPI_uint16);
   EXPECT_EQ(list.asUnsignedList(), (std::vector<std::uint64_t>{1, 2}));
@@ -71,8 +74,14 @@ TEST(NamedValuesTest, NamesAreFoundInAnyCase) {
 }
 
 TEST(ObjectPathTest, KeysCompareByValueInAnyOrderAndWidth) {
-  ObjectPath a{"", "root/a", "FAKE_Widget", {{"Name", Value::string("x")}, {"Number", Value::number(CMPI_uint32, 7)}}};
-  ObjectPath b{"", "root/b", "fake_widget", {{"number", Value::signedNumber(CMPI_sint64, 7)}, {"NAME", Value::string("x")}}};
+  ObjectPath a{"",
+               "root/a",
+               "FAKE_Widget",
+               {{"Name", Value::string("x")}, {"Number", Value::number(CMPI_uint32, 7)}}};
+  ObjectPath b{"",
+               "root/b",
+               "fake_widget",
+               {{"number", Value::signedNumber(CMPI_sint64, 7)}, {"NAME", Value::string("x")}}};
   EXPECT_TRUE(a.sameObject(b));
   EXPECT_FALSE(a == b) << "the namespaces differ";
   b.keys.set("Number", Value::signedNumber(CMPI_sint64, -7));
@@ -82,7 +91,11 @@ TEST(ObjectPathTest, KeysCompareByValueInAnyOrderAndWidth) {
 
 TEST(ObjectPathTest, ReferencesInKeysCompareAsObjects) {
   ObjectPath a{"", "", "FAKE_Link", {{"Antecedent", Value::reference(pathOf("x"))}}};
-  ObjectPath b{"", "", "FAKE_Link", {{"Antecedent", Value::reference({"", "other", "FAKE_Widget", {{"Name", Value::string("x")}}})}}};
+  ObjectPath b{"",
+               "",
+               "FAKE_Link",
+               {{"Antecedent",
+                 Value::reference({"", "other", "FAKE_Widget", {{"Name", Value::string("x")}}})}}};
   EXPECT_TRUE(a.sameObject(b));
 }
 
@@ -114,12 +127,14 @@ TEST_P(TypeNameTest, NamesGoBothWays) {
 
 INSTANTIATE_TEST_SUITE_P(
     All, TypeNameTest,
-    ::testing::Values(TypeRow{CMPI_boolean, "boolean"}, TypeRow{CMPI_uint8, "uint8"}, TypeRow{CMPI_sint8, "sint8"},
-                      TypeRow{CMPI_uint16, "uint16"}, TypeRow{CMPI_sint16, "sint16"}, TypeRow{CMPI_uint32, "uint32"},
-                      TypeRow{CMPI_sint32, "sint32"}, TypeRow{CMPI_uint64, "uint64"}, TypeRow{CMPI_sint64, "sint64"},
-                      TypeRow{CMPI_real32, "real32"}, TypeRow{CMPI_real64, "real64"}, TypeRow{CMPI_char16, "char16"},
-                      TypeRow{CMPI_string, "string"}, TypeRow{CMPI_dateTime, "datetime"}, TypeRow{CMPI_ref, "ref"},
-                      TypeRow{CMPI_instance, "instance"}),
+    ::testing::Values(TypeRow{CMPI_boolean, "boolean"}, TypeRow{CMPI_uint8, "uint8"},
+                      TypeRow{CMPI_sint8, "sint8"}, TypeRow{CMPI_uint16, "uint16"},
+                      TypeRow{CMPI_sint16, "sint16"}, TypeRow{CMPI_uint32, "uint32"},
+                      TypeRow{CMPI_sint32, "sint32"}, TypeRow{CMPI_uint64, "uint64"},
+                      TypeRow{CMPI_sint64, "sint64"}, TypeRow{CMPI_real32, "real32"},
+                      TypeRow{CMPI_real64, "real64"}, TypeRow{CMPI_char16, "char16"},
+                      TypeRow{CMPI_string, "string"}, TypeRow{CMPI_dateTime, "datetime"},
+                      TypeRow{CMPI_ref, "ref"}, TypeRow{CMPI_instance, "instance"}),
     [](const auto& row) { return std::string(row.param.name); });
 
 TEST(TypeNameTest, UnknownCodesAndNamesAreSaidSo) {
