@@ -1,0 +1,373 @@
+// Discovery of targets behind a port.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <array>
+#include <cstring>
+#include <map>
+#include <string>
+#include <utility>
+#include <vector>
+
+#include "Fake_Host.h"
+#include "common/TVX_Memory.h"
+#include "model/TVX_Data.h"
+#include "support/Log_Capture.h"
+
+namespace cimrt {
+namespace {
+
+using testing::ElementsAre;
+using tvx::test::Fake_Host;
+using tvx::test::Log_Capture;
+using tvx::test::wwnOf;
+
+constexpr const char* FAILURE = "HBA_SendScsiInquiry_t(0x80) returns ";
+
+/// The commands of a unit, by page; READ CAPACITY apart.
+enum Command_Kind { STANDARD = 0, SERIAL = 0x80, IDENTIFICATION = 0x83, CAPACITY = 0x100 };
+
+class Targets : public testing::Test {
+ protected:
+  void SetUp() override {
+    host.add("Torvex-A0", 1);
+    host.libraries.provide(HBA_GetFcpTargetMapping,
+                           [this](HBA_HANDLE, HBA_FCPTARGETMAPPING* out) { return map(out); });
+    host.libraries.provide(
+        HBA_SendScsiInquiry,
+        [this](HBA_HANDLE, HBA_WWN, HBA_UINT64, HBA_UINT8 evpd, HBA_UINT32 page, void* response,
+               HBA_UINT32 responseSize, void* sense, HBA_UINT32 senseSize) {
+          EXPECT_EQ(responseSize, 255U);
+          EXPECT_EQ(senseSize, 128U);
+          EXPECT_EQ(evpd, page != 0 ? 1 : 0);
+          return command(static_cast<Command_Kind>(page), response, sense);
+        });
+    host.libraries.provide(
+        HBA_SendReadCapacity,
+        [this](HBA_HANDLE, HBA_WWN, HBA_UINT64, void* response, HBA_UINT32, void* sense,
+               HBA_UINT32) { return command(CAPACITY, response, sense); });
+    data.buildAdapterData();
+    capture.forget();
+  }
+  void TearDown() override {
+    tvxSetAllocator(nullptr);
+    data.freeAllData();
+    EXPECT_EQ(host.open, 0);
+  }
+
+  HBA_STATUS map(HBA_FCPTARGETMAPPING* out) {
+    asked.push_back(out->NumberOfEntries);
+    const HBA_STATUS forced = asked.size() <= statuses.size() ? statuses[asked.size() - 1] : 0;
+    if (forced != 0 && forced != 7) return forced;
+    const auto needed = static_cast<HBA_UINT32>(rows.size());
+    const bool fits = out->NumberOfEntries >= needed && forced == 0;
+    if (fits) {
+      std::copy(rows.begin(), rows.end(), out->entry);
+    }
+    out->NumberOfEntries = claimed != 0 ? claimed : needed;
+    return fits ? 0 : 7;
+  }
+
+  HBA_STATUS command(Command_Kind kind, void* response, void* sense) {
+    sent.push_back(kind);
+    auto& [status, text] = answers[kind];
+    std::memcpy(response, text.data(), std::min<std::size_t>(text.size(), 255));
+    std::memset(sense, 0x5A, 24);
+    return status;
+  }
+
+  HBA_FCPSCSIENTRY& addRow(std::uint8_t number) {
+    HBA_FCPSCSIENTRY row{};
+    row.FcpId.PortWWN = wwnOf(0x50, number);
+    row.FcpId.NodeWWN = wwnOf(0x51, number);
+    return rows.emplace_back(row);
+  }
+  Port& port() { return *data.m_Ports.at(0); }
+  Target& scanOne() {
+    addRow(1);
+    data.buildSANData();
+    return *port().getTarget(0);
+  }
+  std::size_t failures(HBA_STATUS status) const {
+    return capture.count(TVX_DBG, FAILURE + std::to_string(status) + ".");
+  }
+
+  Fake_Host host;
+  Log_Capture capture;
+  Data data;
+  std::vector<HBA_FCPSCSIENTRY> rows;
+  std::vector<HBA_STATUS> statuses;  // of the mapping calls
+  HBA_UINT32 claimed = 0;            // count left in the buffer, if not 0
+  std::vector<HBA_UINT32> asked;     // room of each mapping call
+  std::map<Command_Kind, std::pair<HBA_STATUS, std::string>> answers;
+  std::vector<int> sent;
+};
+
+// ---- The mapping ----
+
+TEST_F(Targets, OneForEachRow) {
+  addRow(1);
+  addRow(1);
+  addRow(2);
+  data.buildSANData();
+  EXPECT_THAT(asked, ElementsAre(256U));
+  EXPECT_EQ(port().getNumberOfTargets(), 3U);
+  EXPECT_EQ(port().getTarget(2)->portWWN, "5000000000000002");
+  for (const char* text :
+       {"buildSANData", "Target Scan from adapter: Torvex-A0", "FCAdapter::rescanTargets",
+        "FCPort::rescanTargets", "To retry the HBA_GetFcpTargetMapping command",
+        "Deleting the allocated memory", "All Ok ...break ", "Successful target info fetched",
+        "Creating Target...", "End Creating Target..."}) {
+    EXPECT_TRUE(capture.has(TVX_DBG, text)) << text;
+  }
+}
+
+TEST_F(Targets, ARescanReplacesTheOldOnes) {
+  addRow(1);
+  data.buildSANData();
+  rows.clear();
+  addRow(2);
+  data.buildSANData();
+  EXPECT_TRUE(capture.has(TVX_DBG, "Freeing Target: 5000000000000001"));
+  ASSERT_EQ(port().getNumberOfTargets(), 1U);
+  EXPECT_EQ(port().getTarget(0)->portWWN, "5000000000000002");
+}
+
+TEST_F(Targets, APortWithoutMappingsHasNone) {
+  data.buildSANData();
+  EXPECT_TRUE(capture.has(TVX_DBG, "HBA_GetFcpTargetMapping_t() found no target mappings"));
+  EXPECT_EQ(port().getNumberOfTargets(), 0U);
+  EXPECT_EQ(host.open, 0);
+}
+
+TEST_F(Targets, AVanishedAdapterLeavesThePortEmpty) {
+  addRow(1);
+  data.buildSANData();
+  host.adapters[0].opens = false;
+  data.buildSANData();
+  EXPECT_EQ(port().getNumberOfTargets(), 0U);
+  EXPECT_TRUE(capture.has(TVX_ERR, "HBA_OpenAdapter failed, skipping Adapter Torvex-A0"));
+  EXPECT_TRUE(capture.has(TVX_ERR, "Issue with Target Rescan - moving to the next Port"));
+}
+
+TEST_F(Targets, ALongerMappingIsReadAgain) {
+  for (int i = 0; i < 300; ++i) addRow(static_cast<std::uint8_t>(i));
+  data.buildSANData();
+  EXPECT_THAT(asked, ElementsAre(256U, 300U));
+  EXPECT_EQ(port().getNumberOfTargets(), 300U);
+  EXPECT_TRUE(capture.has(TVX_DBG, "Increasing the buffer to = 300"));
+}
+
+TEST_F(Targets, StaleDataAreRefreshed) {
+  addRow(1);
+  statuses = {8};
+  data.buildSANData();
+  EXPECT_EQ(host.refreshed, 1);
+  EXPECT_THAT(asked, ElementsAre(256U, 256U));
+  EXPECT_TRUE(capture.has(TVX_DBG, "Refresh and retry ... "));
+  EXPECT_EQ(port().getNumberOfTargets(), 1U);
+}
+
+TEST_F(Targets, ThreeTriesAreAll) {
+  for (const HBA_STATUS status : {7U, 8U}) {
+    capture.forget();
+    asked.clear();
+    rows.clear();
+    addRow(1);
+    statuses.assign(3, status);
+    data.buildSANData();
+    EXPECT_EQ(asked.size(), 3U);
+    EXPECT_EQ(port().getNumberOfTargets(), 0U);
+    EXPECT_TRUE(capture.has(TVX_DBG, "Successful target info fetched"));
+    EXPECT_FALSE(capture.has(TVX_DBG, "All Ok ...break "));
+  }
+}
+
+TEST_F(Targets, AnotherFailureEndsTheScan) {
+  addRow(1);
+  statuses = {12};
+  data.buildSANData();
+  EXPECT_EQ(asked.size(), 1U);
+  EXPECT_EQ(port().getNumberOfTargets(), 0U);
+  EXPECT_TRUE(capture.has(TVX_ERR, "Error hbaStatus=12"));
+  EXPECT_FALSE(capture.has(TVX_DBG, "Successful target info fetched"));
+}
+
+TEST_F(Targets, WithoutMemoryThereAreNone) {
+  addRow(1);
+  tvxSetAllocator([](std::size_t) -> void* { return nullptr; });
+  data.buildSANData();
+  EXPECT_TRUE(asked.empty());
+  EXPECT_TRUE(capture.has(TVX_CRIT, "Could not allocate memory..break "));
+}
+
+TEST_F(Targets, CountsThatNoSanHasAreNotAllocated) {
+  statuses = {7};
+  claimed = 0xFFFFFFFF;
+  data.buildSANData();
+  EXPECT_EQ(asked.size(), 1U);
+  EXPECT_TRUE(capture.has(TVX_CRIT, "Could not allocate memory..break "));
+}
+
+TEST_F(Targets, ACountBeyondTheBufferIsNotBelieved) {
+  addRow(1);
+  claimed = 0x00FFFFFF;
+  data.buildSANData();
+  EXPECT_EQ(port().getNumberOfTargets(), 256U);
+}
+
+TEST_F(Targets, ARowWhoseAdapterDoesNotOpenIsSkipped) {
+  addRow(1);
+  addRow(2);
+  int opens = 0;
+  host.libraries.provide(HBA_OpenAdapter, [&](char*) -> HBA_HANDLE {
+    if (++opens == 2) return 0;  // the port, row 0, row 1
+    ++host.open;
+    return 1;
+  });
+  data.buildSANData();
+  EXPECT_TRUE(capture.has(TVX_ERR, "HBA_OpenAdapter failed, skipping Adapter Torvex-A0"));
+  EXPECT_TRUE(capture.has(TVX_ERR, "target creation failed - moving to the next target"));
+  ASSERT_EQ(port().getNumberOfTargets(), 1U);
+  EXPECT_EQ(port().getTarget(0)->portWWN, "5000000000000002");
+}
+
+// ---- One unit ----
+
+TEST_F(Targets, TakesTheRow) {
+  HBA_FCPSCSIENTRY& row = addRow(0x1F);
+  row.FcpId.FcId = 0x010203;
+  row.FcpId.FcpLun = 0x0102030405060708;
+  std::strcpy(row.ScsiId.OSDeviceName, "/dev/sdx");
+  row.ScsiId.ScsiBusNumber = 1;
+  row.ScsiId.ScsiTargetNumber = 2;
+  row.ScsiId.ScsiOSLun = 3;
+  data.buildSANData();
+  const Target& target = *port().getTarget(0);
+  EXPECT_EQ(target.fcId, 0x010203U);
+  EXPECT_EQ(target.nodeWWN, "510000000000001F");
+  EXPECT_EQ(target.portWWN, "500000000000001F");
+  EXPECT_EQ(target.fcpLun, 0x0102030405060708U);
+  EXPECT_EQ(target.osDeviceName, "/dev/sdx");
+  EXPECT_EQ(target.scsiBusNumber, 1U);
+  EXPECT_EQ(target.scsiTargetNumber, 2U);
+  EXPECT_EQ(target.scsiOSLun, 3U);
+}
+
+TEST_F(Targets, SendsFourCommandsInOrder) {
+  scanOne();
+  EXPECT_THAT(sent, ElementsAre(STANDARD, SERIAL, IDENTIFICATION, CAPACITY));
+  const std::size_t first = capture.position("SCSI Inquiry with 0, 0");
+  const std::size_t second = capture.position("SCSI Inquiry with 1, 0x80");
+  const std::size_t third = capture.position("SCSI Inquiry with 1, 0x83");
+  const std::size_t fourth = capture.position("Send Read Capacity");
+  EXPECT_LT(first, second);
+  EXPECT_LT(second, third);
+  EXPECT_LT(third, fourth);
+  EXPECT_LT(fourth, capture.lines().size());
+}
+
+TEST_F(Targets, TakesTheStandardInquiry) {
+  std::string page(36, ' ');
+  page[0] = '\x61';  // the upper three bits do not count
+  page.replace(8, 8, "TORVEX  ");
+  page.replace(16, 16, "ARRAY           ");
+  page.replace(32, 4, "12\0 ", 4);
+  answers[STANDARD].second = page;
+  const Target& target = scanOne();
+  EXPECT_EQ(target.deviceType, 1U);
+  EXPECT_EQ(target.vendor, "TORVEX  ");
+  EXPECT_EQ(target.model, "ARRAY           ");
+  EXPECT_EQ(target.revision, "12");
+  EXPECT_TRUE(capture.has(TVX_DBG, "DeviceType......1"));
+}
+
+TEST_F(Targets, TakesTheSerialNumber) {
+  answers[SERIAL].second = std::string("\0\x80\0\x04SER1\0rest", 13);
+  EXPECT_EQ(scanOne().serialNumber, "SER1");
+}
+
+TEST_F(Targets, ASerialNumberWithoutAnEndIsBounded) {
+  answers[SERIAL].second = std::string(255, 's');
+  EXPECT_EQ(scanOne().serialNumber, std::string(251, 's'));
+}
+
+TEST_F(Targets, TakesTheFirstIdentificationDescriptor) {
+  std::string page(255, '\x11');
+  page.replace(0, 8, std::string("\x25\x83\x12\x34\xF1\xA3\x00\x04", 8));
+  page.replace(8, 4, "IDEN");
+  answers[IDENTIFICATION].second = page;
+  const DeviceIdentification& id = scanOne().deviceIdentification;
+  EXPECT_EQ(id.peripheralType, 5);
+  EXPECT_EQ(id.pageCode, 0x83);
+  EXPECT_EQ(id.pageLength, 0x34U);
+  EXPECT_EQ(id.identifierType, 3U);
+  EXPECT_EQ(id.identifierLength, 4U);
+  EXPECT_EQ(std::string(id.identifier.begin(), id.identifier.begin() + 4), "IDEN");
+  EXPECT_EQ(id.identifier[4], 0);
+}
+
+TEST_F(Targets, AnIdentifierBehindTheResponseIsBounded) {
+  std::array<std::uint8_t, 255> page{};
+  page.fill(7);
+  page[7] = 255;
+  DeviceIdentification id;
+  EXPECT_EQ(parseDeviceIdentification(&id, page.data()), 0);
+  EXPECT_EQ(id.identifierLength, 255U);
+  EXPECT_EQ(id.identifier[246], 7);
+  EXPECT_EQ(id.identifier[247], 0);
+  EXPECT_EQ(parseDeviceIdentification(nullptr, page.data()), 0x8001);
+}
+
+TEST_F(Targets, TakesTheCapacity) {
+  answers[CAPACITY].second = std::string("\x01\x02\x03\x04\x80\x00\x02\x00", 8);
+  const Target& target = scanOne();
+  EXPECT_EQ(target.blockCount, 0x01020304U);
+  EXPECT_EQ(target.blockSize, 0x80000200U);
+}
+
+TEST_F(Targets, ADeadUnitStaysVisible) {
+  for (const Command_Kind kind : {STANDARD, SERIAL, IDENTIFICATION, CAPACITY}) {
+    answers[kind] = {12, std::string(255, '\xFF')};
+  }
+  const Target& target = scanOne();
+  EXPECT_EQ(target.vendor, "Unknown");
+  EXPECT_EQ(target.model, "Unknown");
+  EXPECT_EQ(target.revision, "Unknown");
+  EXPECT_EQ(target.serialNumber, "Unknown");
+  EXPECT_EQ(target.deviceType, 0U);
+  EXPECT_EQ(target.deviceIdentification.identifierType, 0U);
+  EXPECT_EQ(target.deviceIdentification.identifierLength, 0U);
+  EXPECT_EQ(target.blockCount, 0U);
+  EXPECT_EQ(target.blockSize, 0U);
+  EXPECT_EQ(failures(12), 4U);
+  EXPECT_EQ(sent.size(), 4U);  // no other status is repeated
+}
+
+TEST_F(Targets, CheckConditionsAreTriedThreeTimesEach) {
+  answers[STANDARD].first = 9;
+  const Target& target = scanOne();
+  EXPECT_THAT(sent, ElementsAre(STANDARD, STANDARD, STANDARD, SERIAL, IDENTIFICATION, CAPACITY));
+  EXPECT_EQ(target.vendor, "Unknown");
+  EXPECT_EQ(failures(9), 1U);
+  for (const std::string& text : capture.texts()) EXPECT_FALSE(text.starts_with("Sense Data"));
+}
+
+TEST_F(Targets, AFailedIdentificationLogsTheSenseData) {
+  answers[IDENTIFICATION] = {9, std::string(255, '\xFF')};
+  EXPECT_EQ(scanOne().deviceIdentification.pageCode, 0);
+  std::string sense = "Sense Data: ";
+  for (int i = 0; i < 24; ++i) sense += "5a ";
+  EXPECT_TRUE(capture.has(TVX_DBG, sense));
+  EXPECT_EQ(failures(9), 1U);
+}
+
+TEST_F(Targets, ADeviceWithoutCapacityHasNone) {
+  answers[CAPACITY].first = 9;
+  const Target& target = scanOne();
+  EXPECT_EQ(target.blockCount, 0U);
+  EXPECT_EQ(target.blockSize, 0U);
+}
+
+}  // namespace
+}  // namespace cimrt
