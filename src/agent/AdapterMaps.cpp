@@ -14,7 +14,7 @@ namespace {
 
 // --- One port ------------------------------------------------------------------------------------
 
-// clang-format off: one step a line
+// clang-format off
 constexpr Build_Step<Port_Build> PORT_STEPS[] = {
     classifyChip,
     updateCardFromFRU,
@@ -107,9 +107,13 @@ std::int32_t buildAdapters(Host_Build& host) {
   return 0;
 }
 
-// clang-format off: one step a line
+// clang-format off
 constexpr Build_Step<Host_Build> CARD_STEPS[] = {
-    findFirstPort, buildProviderIdentity, buildProviderConfigSettings, startServices, buildAdapters,
+    findFirstPort,
+    buildProviderIdentity,
+    buildProviderConfigSettings,
+    startServices,
+    buildAdapters,
     buildVirtualPorts,
 };
 // clang-format on
@@ -122,10 +126,15 @@ std::int32_t buildCards(Host_Build& host) {
   return runSteps(CARD_STEPS, host);
 }
 
-// clang-format off: one step a line
+// clang-format off
 constexpr Build_Step<Host_Build> HOST_STEPS[] = {
-    buildComputerSystem, findPlatformChassis, registerBaseProfiles, requireDeviceTree,
-    buildOwnChassis,     buildCards,          updateSoftwareFromFRU,
+    buildComputerSystem,
+    findPlatformChassis,
+    registerBaseProfiles,
+    requireDeviceTree,
+    buildOwnChassis,
+    buildCards,
+    updateSoftwareFromFRU,
     buildRecordLog,
 };
 // clang-format on

@@ -7,6 +7,7 @@
 #include <thread>
 
 #include "Agent_Fixture.h"
+#include "access/TVX_Runtime_Loader.h"
 #include "agent/Signal_Trace.h"
 #include "model/TVX_Data.h"
 

@@ -197,7 +197,7 @@ TEST_F(Refresh, SANReaderIsServedThoughARunMakesItsMapsStaleOnTheWay) {
   }
   awaitIdle(agent);
   EXPECT_GE(log.count(ADAPTER_DATA), 2u);
-  EXPECT_GE(log.count(SAN_MAPS), 2u);
+  EXPECT_GE(log.count(SAN_MAPS), 1u);
 }
 
 TEST_F(Refresh, FailedMapBuildLeavesTheMapsReadyAsTheyStandAndTheNextRunRepairsThem) {
