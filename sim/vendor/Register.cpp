@@ -1,10 +1,11 @@
 // The simulator as a vendor library under the SNIA common library: it hands its entry points over
 // in a table, and exports nothing else that the common library has too.
-// clang-format off: the published headers need the first one before them.
+
+// The published headers lack an include of their own; the first one here has to come first.
+// clang-format off
+#include <ctime>
 #include <hbaapi.h>
 #include <vendorhbaapi.h>
-
-#include <ctime>
 // clang-format on
 
 namespace {
