@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <iostream>
+#include <set>
 
 #include "cim/JsonText.h"
 #include "cli/Arguments.h"
@@ -88,33 +89,36 @@ void printInstances(Session& session, const std::vector<Instance>& instances) {
   }
 }
 
+bool isNames(Operation operation) {
+  return operation == Operation::EnumerateInstanceNames ||
+         operation == Operation::AssociatorNames || operation == Operation::ReferenceNames;
+}
+
+const ObjectPath& pathOf(const ObjectPath& path) {
+  return path;
+}
+const ObjectPath& pathOf(const Instance& instance) {
+  return instance.path;
+}
+
+/// Several association classes may lead to the same object: keeps the first of each.
+template <class T>
+void dropRepeated(std::vector<T>& items) {
+  std::set<std::string> seen;
+  std::erase_if(items, [&](const T& item) {
+    return !pathOf(item).keys.empty() && !seen.insert(printPath(pathOf(item))).second;
+  });
+}
+
 /// For requests to several providers: prints what came, then fails if one of them failed.
 void printReply(Session& session, const Request& request, Reply reply) {
-  // Several association classes may lead to the same object.
-  std::vector<Instance> unique;
-  for (Instance& instance : reply.instances) {
-    const bool known = std::any_of(unique.begin(), unique.end(), [&](const Instance& each) {
-      return each.path == instance.path;
-    });
-    if (!known || instance.path.keys.empty()) {
-      unique.push_back(std::move(instance));
-    }
-  }
-  std::vector<ObjectPath> paths;
-  for (ObjectPath& path : reply.paths) {
-    if (std::find(paths.begin(), paths.end(), path) == paths.end()) {
-      paths.push_back(std::move(path));
-    }
-  }
-  const bool isNames = request.operation == Operation::EnumerateInstanceNames ||
-                       request.operation == Operation::AssociatorNames ||
-                       request.operation == Operation::ReferenceNames;
-  const bool empty = unique.empty() && paths.empty();
-  if (reply.status.ok() || !empty) {
-    if (isNames) {
-      printPaths(session, paths);
+  dropRepeated(reply.instances);
+  dropRepeated(reply.paths);
+  if (reply.status.ok() || !reply.instances.empty() || !reply.paths.empty()) {
+    if (isNames(request.operation)) {
+      printPaths(session, reply.paths);
     } else {
-      printInstances(session, unique);
+      printInstances(session, reply.instances);
     }
   }
   if (!reply.status.ok()) {
@@ -325,14 +329,24 @@ constexpr CommandRow commands[] = {{"ein", enumerate}, {"ei", enumerate},  {"gi"
                                    {"rin", walk},      {"cm", callMethod}, {"ci", create},
                                    {"mi", modify},     {"di", remove},     {"ports", ports}};
 
+/// Strict mode's findings are told after a failure too.
+ExitCode runInSession(const CommandRow& command, Session& session) {
+  try {
+    const ExitCode code = command.run(session);
+    const ExitCode strict = session.finish();
+    return code == ExitCode::Ok ? strict : code;
+  } catch (const CommandError&) {
+    session.finish();
+    throw;
+  }
+}
+
 ExitCode runWithLibrary(const Options& options, const ClassCatalogue& classes, std::ostream& out,
                         std::ostream& err) {
   for (const CommandRow& command : commands) {
     if (options.command == command.name) {
       Session session(options, classes, out, err);
-      const ExitCode code = command.run(session);
-      const ExitCode strict = session.finish();
-      return code == ExitCode::Ok ? strict : code;
+      return runInSession(command, session);
     }
   }
   throw CommandError(ExitCode::Usage, "unknown command '" + options.command + "'");

@@ -42,6 +42,8 @@ void addGlobals(CLI::App& app, Options& options, Raw& raw) {
                  "use the simulated adapter libraries, with a scenario by name or file")
       ->type_name("[SCENARIO]")
       ->expected(0, 1);
+  app.add_flag("--fresh", options.freshSimulation,
+               "with --sim: forget what earlier commands changed in this scenario");
   app.add_option("--root", options.root, "folder to put before all fixed paths of the provider")
       ->type_name("DIR");
   app.add_option("--namespace", options.nameSpace, "namespace of paths and classes without one")

@@ -17,6 +17,7 @@ struct Options {
   // Global options.
   std::string library;                  ///< empty: looked for
   std::optional<std::string> scenario;  ///< set with --sim; empty for the default one
+  bool freshSimulation = false;         ///< forget what earlier runs changed
   std::string root;
   std::string nameSpace;
   Format format = Format::Table;

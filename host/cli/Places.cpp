@@ -114,6 +114,22 @@ void restart(const char* const* argv) {
   throw CommandError(ExitCode::Library, "cannot start tvxcim anew with the simulated libraries");
 }
 
+/// What commands change in a scenario is kept below the root, one file a scenario, so that the next
+/// command finds it.
+void prepareState(const Options& options, const fs::path& scenario) {
+  if (environment("TVX_SIM_STATE").empty()) {
+    const std::string name =
+        fmt::format("sim-{}-{:016x}.state", scenario.empty() ? "default" : scenario.stem().string(),
+                    std::hash<std::string>()(scenario.string()));
+    setVariable("TVX_SIM_STATE", (fs::path(environment("TVX_ROOT")) / name).string());
+  }
+  // Once: the program may be on its second start.
+  if (options.freshSimulation && environment(restartMark).empty()) {
+    std::error_code error;
+    fs::remove(environment("TVX_SIM_STATE"), error);
+  }
+}
+
 void prepareSimulation(const Options& options, const char* const* argv) {
   const fs::path folder = findSimulatedLibraries();
   const fs::path scenario = findScenario(*options.scenario);
@@ -123,6 +139,7 @@ void prepareSimulation(const Options& options, const char* const* argv) {
   if (options.root.empty() && environment("TVX_ROOT").empty()) {
     setVariable("TVX_ROOT", privateRoot().string());
   }
+  prepareState(options, scenario);
   if (!putBeforeSearchPath(folder)) {
     restart(argv);
   }

@@ -166,6 +166,15 @@ std::vector<PortRow> portRows(const std::vector<Instance>& ports,
   return rows;
 }
 
+namespace {
+
+/// A port that has not joined a fabric shows the name 0.
+std::string fabricText(const std::string& fabric) {
+  return fabric.find_first_not_of("0:") == std::string::npos ? "-" : fabric;
+}
+
+}  // namespace
+
 std::string portTable(const std::vector<PortRow>& rows) {
   if (rows.empty()) {
     return "no FC ports\n";
@@ -173,7 +182,7 @@ std::string portTable(const std::vector<PortRow>& rows) {
   Table table({"WWPN", "MODEL", "SPEED", "STATE", "TYPE", "FC ID", "FABRIC", "FIRMWARE"});
   for (const PortRow& row : rows) {
     table.add({row.wwpn, row.model.empty() ? row.adapter : row.model, speedWords(row.speed),
-               row.state, row.type, row.fcId, row.fabric, row.firmware});
+               row.state, row.type, row.fcId, fabricText(row.fabric), row.firmware});
   }
   return table.text();
 }

@@ -57,6 +57,13 @@ TEST(PortsTest, WithoutACardTheAdaptersNameStandsForTheModel) {
   EXPECT_NE(portTable(portRows({port("SN1")}, {})).find("adapter-1"), std::string::npos);
 }
 
+TEST(PortsTest, APortWithoutAFabricShowsADash) {
+  Instance lonely = port("SN1");
+  lonely.properties.set("FabricName", Value::string("00:00:00:00:00:00:00:00"));
+  EXPECT_NE(portTable(portRows({lonely}, {})).find("0x010203  -       12.8\n"), std::string::npos)
+      << portTable(portRows({lonely}, {}));
+}
+
 TEST(PortsTest, MissingPropertiesAreUnknown) {
   const auto rows = portRows({Instance{{"", "", "TVXHBA_FCPort", {}}, {}}}, {});
   EXPECT_EQ(rows[0].state, "Unknown");

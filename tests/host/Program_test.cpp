@@ -6,6 +6,9 @@
 #include <cstdio>
 #include <fstream>
 #include <nlohmann/json.hpp>
+#include <regex>
+
+#include "cli/ExitCode.h"
 
 namespace tvx::host {
 namespace {
@@ -36,6 +39,11 @@ Outcome run(const std::string& words, bool withLibrary = true) {
 
 nlohmann::json jsonOf(const Outcome& result) {
   return nlohmann::json::parse(result.out);
+}
+
+/// A text as the manual page writes it.
+std::string manText(const std::string& text) {
+  return std::regex_replace(text, std::regex("--"), "\\-\\-");
 }
 
 constexpr const char* first = R"('FAKE_Widget.Name="widget0",Number=0')";
@@ -81,8 +89,9 @@ TEST(ProgramTest, ClassesNeedNoLibrary) {
       << result.out;
   EXPECT_NE(result.out.find("3 classes\n"), std::string::npos);
   EXPECT_NE(run("classes --all", false).out.find("5 classes\n"), std::string::npos);
-  EXPECT_NE(run("classes --methods", false).out.find("FAKE_Widget: uint32 Misbehave(in string How)"),
-            std::string::npos)
+  EXPECT_NE(
+      run("classes --methods", false).out.find("FAKE_Widget: uint32 Misbehave(in string How)"),
+      std::string::npos)
       << run("classes --methods", false).out;
   EXPECT_EQ(jsonOf(run("--json classes", false))["classes"].size(), 3U);
 }
@@ -282,6 +291,29 @@ TEST(ProgramTest, StrictModeReportsAndALeakIsCodeEleven) {
             std::string::npos)
       << leak.err;
   EXPECT_NE(leak.err.find("strict: something leaked\n"), std::string::npos);
+}
+
+TEST(ProgramTest, StrictModeReportsAfterAFailureToo) {
+  const Outcome result = run(R"(--strict gi 'FAKE_Widget.Name="x",Number=0')");
+  EXPECT_EQ(result.exitCode, 6);
+  EXPECT_NE(result.err.find("strict: nothing leaked\n"), std::string::npos) << result.err;
+}
+
+TEST(ProgramTest, TheManualPageListsExitCodesAndOptions) {
+  std::ifstream stream(TVXCIM_MAN);
+  const std::string page((std::istreambuf_iterator<char>(stream)), {});
+  for (const ExitCodeText& each : exitCodeTexts) {
+    EXPECT_NE(
+        page.find(".B " + std::to_string(static_cast<int>(each.code)) + "\n" + manText(each.text)),
+        std::string::npos)
+        << each.text;
+  }
+  const std::string help = run("--help", false).out;
+  const std::regex option("\n  (--[a-z-]+)");
+  for (std::sregex_iterator i(help.begin(), help.end(), option), end; i != end; ++i) {
+    std::string escaped = std::regex_replace((*i)[1].str(), std::regex("-"), "\\-");
+    EXPECT_NE(page.find(escaped), std::string::npos) << (*i)[1];
+  }
 }
 
 TEST(ProgramTest, BrokerVersionsAreSelectable) {
