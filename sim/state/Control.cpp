@@ -77,6 +77,23 @@ void tvxsim_advance(unsigned seconds) {
   });
 }
 
+int tvxsim_set_link(const char* wwpn, const char* json) {
+  return report([=] {
+    const std::optional<Wwn> name = parse_wwn(wwpn ? wwpn : "");
+    const nlohmann::json object = nlohmann::json::parse(json ? json : "");
+    return Simulation::instance().with_world([&](World& world) -> std::string {
+      Port* port = name ? world.find_port(*name) : nullptr;
+      if (port == nullptr) return "no such port";
+      const Json_Reader reader(object, "");
+      Port changed = *port;
+      read_link(reader, changed);
+      reader.finish();
+      *port = std::move(changed);
+      return {};
+    });
+  });
+}
+
 int tvxsim_post_event(const char* wwpn, unsigned type, unsigned fabric_port) {
   int called = 0;
   const int status = report([&] {

@@ -147,7 +147,7 @@ std::optional<Json_Reader> Json_Reader::object(const std::string& key) const {
 
 void Json_Reader::finish() const {
   for (const auto& member : m_pObject->items()) {
-    if (member.key() != "comment" && !m_Known.contains(member.key())) {
+    if (member.key() != "comment" && member.key() != "$schema" && !m_Known.contains(member.key())) {
       fail(member.key(), "is not a name that is known here");
     }
   }

@@ -1,5 +1,6 @@
 #include <cstdio>
 
+#include "rmapi/snia_hba.h"
 #include "state/Scenario_Parts.h"
 
 namespace tvx::sim {
@@ -141,29 +142,27 @@ Attribute_Map read_card_values(const Json_Reader& reader, const Card& card, std:
   return values;
 }
 
+constexpr std::uint32_t fec_state_id = 0x360;
+
 Bytes fcp_types() {
   Bytes types(32);
   types[2] = 1;  // the FCP bit
   return types;
 }
 
-void read_link(const Json_Reader& reader, Port& port, std::size_t card) {
-  port.fc_id = reader.number<std::uint32_t>(
-      "fc_id", 0x010000 + static_cast<std::uint32_t>(card * 0x400 + port.number * 0x100));
-  port.fabric_name = reader.wwn("fabric_name", wwn_from_number(0x100000054D5A8000ULL));
-  port.type = reader.choice("type", 5, port_types);
-  port.state = reader.choice("state", 2, port_states);
-  port.hba_state = reader.choice("hba_state", 0, port_states);
-  port.supported_speed = reader.choice("supported_speed", 8 | 16 | 32, speeds);
-  port.speed = reader.choice("speed", 32, speeds);
-  port.class_of_service = reader.number<std::uint32_t>("class_of_service", 8);
-  port.supported_fc4_types =
-      reader.has("supported_fc4_types") ? reader.bytes("supported_fc4_types") : fcp_types();
-  port.active_fc4_types =
-      reader.has("active_fc4_types") ? reader.bytes("active_fc4_types") : fcp_types();
-  port.max_frame_size = reader.number<std::uint32_t>("max_frame_size", 2048);
-  port.discovered_ports = reader.number<std::uint32_t>("discovered_ports", 2);
-  port.values.emplace(0x360, number_value(reader.choice("fec_state", 0, fec_states)));
+// The link of a port that the scenario says nothing about.
+void make_link(Port& port) {
+  port.fc_id = 0x010000 + static_cast<std::uint32_t>(port.card * 0x400 + port.number * 0x100);
+  port.fabric_name = wwn_from_number(0x100000054D5A8000ULL);
+  port.type = HBA_PORTTYPE_NPORT;
+  port.state = HBA_PORTSTATE_ONLINE;
+  port.supported_speed = 8 | 16 | 32;
+  port.speed = 32;
+  port.class_of_service = 8;  // class 3
+  port.supported_fc4_types = port.active_fc4_types = fcp_types();
+  port.max_frame_size = 2048;
+  port.discovered_ports = 2;
+  port.values.emplace(fec_state_id, number_value(0));
 }
 
 void read_names(const Json_Reader& reader, Port& port, std::size_t card, std::size_t host) {
@@ -196,7 +195,8 @@ Port read_port(const Json_Reader& reader, const Json_Reader& card_reader, World&
   port.card = world.cards.size() - 1;
   port.number = number;
   read_names(reader, port, port.card, world.ports.size());
-  read_link(reader, port, port.card);
+  make_link(port);
+  read_link(reader, port);
   read_port_card_values(reader, card_values, port);
   const Card& card = world.cards.back();
   port.symbolic_name =
@@ -229,6 +229,27 @@ void append_adapters(const Json_Reader& card, World& world, std::size_t first_po
 }
 
 }  // namespace
+
+void read_link(const Json_Reader& reader, Port& port) {
+  port.fc_id = reader.number<std::uint32_t>("fc_id", port.fc_id);
+  port.fabric_name = reader.wwn("fabric_name", port.fabric_name);
+  port.type = reader.choice("type", port.type, port_types);
+  port.state = reader.choice("state", port.state, port_states);
+  port.hba_state = reader.choice("hba_state", port.hba_state, port_states);
+  port.supported_speed = reader.choice("supported_speed", port.supported_speed, speeds);
+  port.speed = reader.choice("speed", port.speed, speeds);
+  port.class_of_service = reader.number<std::uint32_t>("class_of_service", port.class_of_service);
+  if (reader.has("supported_fc4_types")) {
+    port.supported_fc4_types = reader.bytes("supported_fc4_types");
+  }
+  if (reader.has("active_fc4_types")) port.active_fc4_types = reader.bytes("active_fc4_types");
+  port.max_frame_size = reader.number<std::uint32_t>("max_frame_size", port.max_frame_size);
+  port.discovered_ports = reader.number<std::uint32_t>("discovered_ports", port.discovered_ports);
+  if (reader.has("fec_state")) {
+    port.values.insert_or_assign(fec_state_id,
+                                 number_value(reader.choice("fec_state", 0, fec_states)));
+  }
+}
 
 void read_attributes(const Json_Reader& parent, const std::string& key,
                      std::span<const Attribute_Row> rows, Attribute_Map& values,

@@ -9,6 +9,9 @@ namespace tvx::sim {
 /// Reads one element of "cards" and appends the card, its ports and its adapters to the world.
 void read_card(const Json_Reader& card, World& world);
 
+/// Reads what is said of a port's link; the rest of it stays.
+void read_link(const Json_Reader& port_reader, Port& port);
+
 /// Reads one element of the "targets" of a port.
 Target read_target(const Json_Reader& target);
 

@@ -112,6 +112,20 @@ TEST_F(Faults, CallsAreCountedWholeAndByPort) {
   EXPECT_EQ(tvxsim_calls("LRM_GetDriverType", "1000000000000000"), 0u);
 }
 
+TEST_F(Faults, TheLinkOfAPortCanChange) {
+  ASSERT_EQ(tvxsim_set_link("10000254560C4110", R"({"state": "link down", "speed": "unknown"})"),
+            0);
+  HBA_PORTATTRIBUTES attributes{};
+  ASSERT_EQ(SIM_CALL(hba, HBA_GetAdapterPortAttributes, open("Torvex-TVX16002-1"), 0u, &attributes),
+            0u);
+  EXPECT_EQ(attributes.PortState, HBA_PORTSTATE_LINKDOWN + 0u);
+  EXPECT_EQ(attributes.PortSpeed, 0u);
+  EXPECT_EQ(attributes.PortFcId, 0x010400u);
+  EXPECT_EQ(tvxsim_set_link("10000254560C4110", R"({"serial_number": "x"})"), -1);
+  EXPECT_EQ(tvxsim_set_link("1000000000000000", "{}"), -1);
+  EXPECT_STREQ(tvxsim_last_error(), "no such port");
+}
+
 TEST_F(Faults, AMalformedFaultIsRefusedWithItsPlace) {
   EXPECT_EQ(tvxsim_add_fault(R"({"call": "LRM_InitLib", "statos": 3})"), -1);
   EXPECT_STREQ(tvxsim_last_error(), "/statos: is not a name that is known here");

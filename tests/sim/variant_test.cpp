@@ -2,6 +2,8 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
+#include <functional>
+#include <nlohmann/json.hpp>
 
 #include "sim/Libraries.h"
 
@@ -172,6 +174,43 @@ INSTANTIATE_TEST_SUITE_P(
 TEST_F(Variants, TextThatIsNotJsonIsRefused) {
   const std::string line = capture_errors([] { EXPECT_EQ(tvxsim_load_text("{"), -1); });
   EXPECT_NE(line.find("/: is not JSON: "), std::string::npos) << line;
+}
+
+// Every member that the schema names is one that the reader asks for.
+void expect_known(const nlohmann::json& properties, const std::string& pointer,
+                  const std::function<nlohmann::json(const nlohmann::json&)>& scenario_with) {
+  ASSERT_FALSE(properties.empty());
+  for (const auto& member : properties.items()) {
+    const nlohmann::json object = {{member.key(), {{"odd", 1}}}};
+    tvxsim_load_text(scenario_with(object).dump().c_str());
+    EXPECT_EQ(std::string(tvxsim_last_error())
+                  .find(pointer + "/" + member.key() + ": is not a name that is known"),
+              std::string::npos)
+        << tvxsim_last_error();
+  }
+}
+
+TEST_F(Variants, TheSchemaNamesOnlyMembersThatAreKnown) {
+  using nlohmann::json;
+  std::ifstream file(TVXSIM_SCENARIOS "/../scenario.schema.json");
+  const json schema = json::parse(file);
+  capture_errors([&schema] {
+    const json port = json::object();
+    expect_known(schema["$defs"]["port"]["properties"], "/cards/0/ports/0", [](const json& object) {
+      return json{{"cards", {{{"ports", {object}}}}}};
+    });
+    expect_known(schema["properties"]["cards"]["items"]["properties"], "/cards/0",
+                 [&port](json object) {
+                   if (!object.contains("ports")) object["ports"] = {port};
+                   return json{{"cards", {object}}};
+                 });
+    expect_known(schema["properties"]["faults"]["items"]["properties"], "/faults/0",
+                 [](json object) {
+                   if (!object.contains("call")) object["call"] = "LRM_InitLib";
+                   return json{{"faults", {object}}};
+                 });
+    expect_known(schema["properties"], "", [](const json& object) { return object; });
+  });
 }
 
 class Shipped_Scenarios : public ::testing::TestWithParam<std::filesystem::path> {};

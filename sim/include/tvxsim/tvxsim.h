@@ -37,6 +37,11 @@ void tvxsim_forget_calls(void);
 /* Puts the clock of the counters forward. */
 void tvxsim_advance(unsigned seconds);
 
+/* Changes the link of a port: an object with the members of a scenario's port that tell of its
+ * link, such as {"state": "link down", "speed": "unknown"}. 0, or -1 if the port or the object is
+ * wrong. */
+int tvxsim_set_link(const char* wwpn, const char* json);
+
 /* Calls the callbacks that were registered for events of the port, on this thread, and answers how
  * many there were; -1 for a malformed name. */
 int tvxsim_post_event(const char* wwpn, unsigned type, unsigned fabric_port);
