@@ -49,14 +49,14 @@ inline std::vector<const Instance*> endsOf(const Instance* association) {
 /// True if the association ties clones of these two, in this order.
 inline bool tiesClones(const Instance* association, const Instance* first, const Instance* second) {
   const std::vector<const Instance*> ends = endsOf(association);
-  return ends.size() == 2 && ends[0] && ends[1] && ends[0] != first && ends[1] != second &&
-         identical(ends[0], first) && identical(ends[1], second);
+  return first && second && ends.size() == 2 && ends[0] && ends[1] && ends[0] != first &&
+         ends[1] != second && identical(ends[0], first) && identical(ends[1], second);
 }
 
 /// The same by keys alone, for ends that changed after the association was made.
 inline bool tiesKeys(const Instance* association, const Instance* first, const Instance* second) {
   const std::vector<const Instance*> ends = endsOf(association);
-  return ends.size() == 2 && ends[0] && ends[1] && key_eq(ends[0], first) &&
+  return first && second && ends.size() == 2 && ends[0] && ends[1] && key_eq(ends[0], first) &&
          key_eq(ends[1], second);
 }
 

@@ -1,6 +1,4 @@
 // The five services, the access point and what they are tied to.
-#include <map>
-
 #include "Agent_Fixture.h"
 #include "Instance_Checks.h"
 #include "access/TVX_Runtime_Loader.h"
@@ -181,28 +179,49 @@ TEST_F(Hosted_Services, TaggingHasSoftwareOfItsOwn) {
 }
 
 TEST_F(Hosted_Services, FailedStartIsLoggedAndEndsTheBuild) {
+  writeFile("etc/tvx_smis.conf", "https://manager\n");
   ProviderAgent& agent = build();
-  const std::map<std::string, Instance_Map_Base*> firstRefused = {
-      {"StartSoftwareInstallationService failed", &agent.m_TVXHBA_SoftwareInstallationService_map},
-      {"Failed to create WWN Services class", &agent.m_TVXHBA_FCHBAWWNService_map},
-      {"StartFCTagService failed", &agent.m_TVXHBA_FCTagService_map},
-      {"StartBootBIOSService failed", &agent.m_TVXHBA_BootBIOSService_map},
-      {"StartFCHBADriverParamService failed", &agent.m_TVXHBA_FCHBADriverParamService_map},
+  struct Refusal {
+    const char* failure;
+    const char* insertFailure;
+    Instance_Map_Base& map;
+    Ref<Instance> kept;
   };
-  for (const auto& [failure, map] : firstRefused) {
-    SCOPED_TRACE(failure);
-    const Ref<Instance> kept(clone(map->at(0)));
+  const auto refusal = [](const char* failure, const char* insertFailure, Instance_Map_Base& map) {
+    return Refusal{failure, insertFailure, map, Ref<Instance>(clone(map.at(0)))};
+  };
+  const Refusal refusals[] = {
+      refusal("StartSoftwareInstallationService failed",
+              "Insert Failed : m_TVXHBA_SoftwareInstallationService_map",
+              agent.m_TVXHBA_SoftwareInstallationService_map),
+      refusal("Failed to create WWN Services class", "Insert Failed : m_TVXHBA_FCHBAWWNService_map",
+              agent.m_TVXHBA_FCHBAWWNService_map),
+      refusal("StartFCTagService failed", "Insert Failed : m_TVXHBA_FCTagService_map",
+              agent.m_TVXHBA_FCTagService_map),
+      refusal("StartBootBIOSService failed", "Insert Failed : m_TVXHBA_BootBIOSService_map",
+              agent.m_TVXHBA_BootBIOSService_map),
+      refusal("StartFCHBADriverParamService failed",
+              "Insert Failed : m_TVXHBA_FCHBADriverParamService_map",
+              agent.m_TVXHBA_FCHBADriverParamService_map),
+      refusal("CreateHBAAccessPointProfiles failed",
+              "Insert Failed : m_TVXHBA_RemoteServiceAccessPoint_map",
+              agent.m_TVXHBA_RemoteServiceAccessPoint_map),
+  };
+  for (const Refusal& expected : refusals) {
+    SCOPED_TRACE(expected.failure);
     agent.clearAdapterMaps();
     auto system = makeInstance<CIM_ComputerSystem>();
     system->CreationClassName.set("CIM_ComputerSystem");
     system->Name.set(agent.m_HostName.c_str());
     Host_Build host{agent};
     host.system = insertInto(agent.m_CIM_ComputerSystem_map, std::move(system), "x");
-    ASSERT_NE(map->insert(clone(kept.get())), Instance_Map_Base::npos);
+    ASSERT_NE(expected.map.insert(clone(expected.kept.get())), Instance_Map_Base::npos);
     log.clear();
     EXPECT_EQ(startServices(host), MAP_BUILD_FAILED);
-    EXPECT_EQ(log.level(failure), TVX_CRIT);
-    EXPECT_EQ(log.count("CreateDriverIdentity failed"), 0u);
+    EXPECT_EQ(log.level(expected.insertFailure), TVX_CRIT);
+    EXPECT_EQ(log.level(expected.failure), TVX_CRIT);
+    // Nothing after the failed step was started.
+    EXPECT_EQ(host.driverIdentity, nullptr);
   }
 }
 

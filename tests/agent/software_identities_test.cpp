@@ -31,8 +31,11 @@ class Software_Identities : public Agent_Test {
   /// One card of one port, 0xE300, without data of the field replaceable unit.
   static std::string plainPort(const std::string& more = {}) {
     return R"({"library": {"versions": {"0x66": "12.8.1", "0x68": "10.4.2"}}, "cards": [{"model":
-        "TVX1", "serial_number": "SN1", "firmware_version": "2.01a4",
+        "TVX1", "serial_number": "SN1", "firmware_version": "2.01a4", "driver_name": "tvxfc",
         "option_rom_version": "5.30a2", )" +
+           std::string(more.find("driver_version") == more.npos
+                           ? R"("driver_version": "12.8.351.47", )"
+                           : "") +
            more + R"("ports": [{"wwpn": "10:00:00:00:00:00:00:01",
         "wwnn": "20:00:00:00:00:00:00:01", "fru": []}]}]})";
   }
@@ -187,7 +190,8 @@ TEST_F(Software_Identities, DriverAndDiagnosticsOfManyPortsExistOnce) {
   ProviderAgent& agent = build(singlePortCards(3));
   std::size_t drivers = 0;
   for (std::size_t i = 0; i < agent.m_TVXHBA_SoftwareIdentity_map.size(); i++)
-    drivers += textOf(agent.m_TVXHBA_SoftwareIdentity_map[i]->InstanceID) == DRIVER ? 1 : 0;
+    drivers +=
+        textOf(agent.m_TVXHBA_SoftwareIdentity_map[i]->Description) == "Torvex HBA Driver" ? 1 : 0;
   EXPECT_EQ(drivers, 1u);
   EXPECT_EQ(log.count("Generating TVXHBA_SoftwareConformsToProfile (Driver, Software Inventory)"),
             1u);
