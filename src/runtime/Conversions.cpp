@@ -10,8 +10,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <limits>
-#include <stdexcept>
-#include <string_view>
 
 namespace cimrt {
 namespace {
@@ -113,27 +111,6 @@ bool is_real(const char* text) {
   }
   return *p == '\0';
 }
-
-/// First character, length and last character of a type name tell the names apart.
-constexpr std::size_t type_hash(const char* name, std::size_t length) {
-  constexpr auto lower = [](char c) { return c >= 'A' && c <= 'Z' ? c + ('a' - 'A') : c; };
-  return static_cast<std::size_t>(lower(name[0]) ^ lower(name[length - 1])) ^ length;
-}
-
-/// The one type whose name may have a hash, by hash; NONE where there is none.
-constexpr std::array<std::int8_t, 64> type_candidates = [] {
-  constexpr std::string_view names[NUM_TYPES] = {
-      "boolean", "uint8",  "sint8",  "uint16", "sint16", "uint32", "sint32",
-      "uint64",  "sint64", "real32", "real64", "char16", "string", "datetime"};
-  std::array<std::int8_t, 64> candidates{};
-  candidates.fill(NONE);
-  for (std::size_t i = 0; i < NUM_TYPES; ++i) {
-    std::int8_t& place = candidates.at(type_hash(names[i].data(), names[i].size()) % 64);
-    if (place != NONE) throw std::logic_error("two type names share a hash");
-    place = static_cast<std::int8_t>(i);
-  }
-  return candidates;
-}();
 
 /// The "C" locale: the decimal separator of a CIM real is always '.'.
 locale_t c_locale() {
@@ -247,12 +224,12 @@ int str_to_real32(const char* text, float& out) {
 }
 
 int str_to_type(const char* name, Type& out) {
-  const std::size_t length = std::strlen(name);
-  if (length == 0) return -1;
-  const int candidate = type_candidates[type_hash(name, length) % type_candidates.size()];
-  if (candidate == NONE || strcasecmp(type_name_table[candidate], name) != 0) return -1;
-  out = static_cast<Type>(candidate);
-  return 0;
+  for (std::size_t i = 0; i < NUM_TYPES; ++i) {
+    if (!name_eq(type_name_table[i], name)) continue;
+    out = static_cast<Type>(i);
+    return 0;
+  }
+  return -1;
 }
 
 const char* uint8_to_str(char (&buffer)[NUMBER_TEXT_SIZE], std::uint8_t x, std::size_t& size) {
