@@ -173,6 +173,14 @@ void destroy_method(Meta_Method* method) {
   bury(method);
 }
 
+void destroy_class(Meta_Class* meta_class) {
+  destroy_features(meta_class);
+  free_block(meta_class->locals);
+  unref(meta_class->super_meta_class);
+  destroy_head(meta_class);
+  bury(meta_class);
+}
+
 void destroy_feature(Meta_Feature* feature) {
   if (is_property(feature)) {
     destroy_property(static_cast<Meta_Property*>(feature));
@@ -181,7 +189,7 @@ void destroy_feature(Meta_Feature* feature) {
   } else if (is_method(feature)) {
     destroy_method(static_cast<Meta_Method*>(feature));
   } else {
-    destroy(static_cast<Meta_Class*>(feature));
+    destroy_class(static_cast<Meta_Class*>(feature));
   }
 }
 
@@ -282,12 +290,7 @@ Meta_Class* clone(const Meta_Class* meta_class) {
 }
 
 void destroy(Meta_Class* meta_class) {
-  if (is_static(meta_class)) return;
-  destroy_features(meta_class);
-  free_block(meta_class->locals);
-  unref(meta_class->super_meta_class);
-  destroy_head(meta_class);
-  bury(meta_class);
+  if (!is_static(meta_class)) destroy_class(meta_class);
 }
 
 Meta_Class* create_meta_class(const char* name, const Meta_Class* super, std::uint32_t flags) {
