@@ -7,12 +7,19 @@
 
 namespace cimrt {
 
+template <class T>
+concept Value_Scalar = requires {
+  Type_Of<T>::value;
+};
+
 /// `Type` code of what a C++ type is stored as: scalars, and arrays of them.
 template <class T>
-struct Value_Type_Of {
+struct Value_Type_Of;
+template <Value_Scalar T>
+struct Value_Type_Of<T> {
   static constexpr Type value = Type_Of<T>::value;
 };
-template <class T>
+template <Value_Scalar T>
 struct Value_Type_Of<Array<T>> {
   static constexpr Type value = static_cast<Type>(Type_Of<T>::value | ARRAY_BIT);
 };
