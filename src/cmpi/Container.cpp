@@ -25,6 +25,26 @@ void release_targets(Instance* instance, const Meta_Feature* feature) {
   targets.clear();
 }
 
+/// Makes every feature null that can be: lists of references too, which the instance's own
+/// operation leaves alone.
+void nullify(Instance* instance) {
+  nullify_properties(instance, true, true, true);
+  const Meta_Record* meta_class = instance->meta_class;
+  for (std::uint64_t i = 0; i < meta_class->num_meta_features; ++i) {
+    const Meta_Feature* feature = meta_class->meta_features[i];
+    if (is_reference(feature) && as_reference(feature)->subscript != 0)
+      *null_flag(instance, feature) = 1;
+  }
+}
+
+/// Stores a value, and its null mark where the value itself does not carry it over.
+int store(const Value& value, Instance* instance, const Meta_Feature* feature) {
+  release_targets(instance, feature);
+  if (value.set(instance, feature) != 0) return -1;
+  if (value.type() == INSTANCE_ARRAY) *null_flag(instance, feature) = value.null() ? 1 : 0;
+  return 0;
+}
+
 }  // namespace
 
 bool is_null(const Instance* instance, const Meta_Feature* feature) {
@@ -37,7 +57,7 @@ int Container::convert(const Meta_Record* meta_class, std::uint32_t flags, Insta
   Ref<Instance> made;
   if (!instance) made.reset(create_record(meta_class));
   Instance* record = made ? made.get() : instance;
-  nullify_properties(record, true, true, true);
+  nullify(record);
 
   const std::uint32_t size = get_size();
   for (std::uint32_t index = 0; index < size; ++index) take(index, meta_class, flags, record);
