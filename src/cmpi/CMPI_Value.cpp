@@ -99,8 +99,8 @@ const Meta_Class* class_at(const Place& place, const CMPIObjectPath* path) {
   return found;
 }
 
-int finish_instance(int result, Instance* instance) {
-  if (result == 0 && instance) return 0;
+int convert_all(Container& container, const Meta_Class* meta_class, Instance*& out) {
+  if (container.convert(meta_class, 0, out) == 0 && out) return 0;
   CIMRT_TRACE(LOG_WARN_, "failed to create CIMRT instance");
   return -1;
 }
@@ -116,7 +116,7 @@ int read_embedded(const Place& place, CMPIInstance* embedded, Instance*& out) {
   const Meta_Class* meta_class = class_at(place, path);
   if (!meta_class) return -1;
   CMPIInstance_Container container(place.repository, place.broker, place.name_space, embedded);
-  return finish_instance(container.convert(meta_class, 0, out), out);
+  return convert_all(container, meta_class, out);
 }
 
 int read_reference(const Place& place, CMPIObjectPath* path, Instance*& out) {
@@ -127,7 +127,7 @@ int read_reference(const Place& place, CMPIObjectPath* path, Instance*& out) {
   const Meta_Class* meta_class = class_at(place, path);
   if (!meta_class) return -1;
   CMPIObjectPath_Container container(place.repository, place.broker, place.name_space, path);
-  return finish_instance(container.convert(meta_class, 0, out), out);
+  return convert_all(container, meta_class, out);
 }
 
 /// An embedded instance or a reference; a null pointer gives a null instance.

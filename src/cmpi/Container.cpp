@@ -87,12 +87,8 @@ void Container::take(std::uint32_t index, const Meta_Record* meta_class, std::ui
     return;
   }
   Value value;
-  bool taken = get_value(index, type, value) == 0;
-  if (taken) {
-    release_targets(instance, feature);
-    taken = value.set(instance, feature) == 0;
-  }
-  if (!taken) CIMRT_TRACE(LOG_WARN_, "unexpected failure: %s.%s", meta_class->name, name.c_str());
+  if (get_value(index, type, value) != 0 || store(value, instance, feature) != 0)
+    CIMRT_TRACE(LOG_WARN_, "unexpected failure: %s.%s", meta_class->name, name.c_str());
 }
 
 int Container::convert(const Instance* instance, std::uint32_t flags) {

@@ -9,6 +9,7 @@
 #include "Test_Server.h"
 #include "Trace_Log.h"
 #include "cmpi/cimom.h"
+#include "runtime/Thread_Context.h"
 
 namespace cimrt::test {
 namespace {
