@@ -524,6 +524,7 @@ TEST_F(Instance_Operations, TwoClassesAreServedAtTheSameTime) {
   server.broker.enumerateInstances("TEST_Spare");
   first.join();
   EXPECT_EQ(inside, 2);
+  server.broker.unload(true);
 }
 
 TEST_F(Instance_Operations, OneClassServesOneRequestAtATime) {

@@ -235,7 +235,7 @@ TEST_F(Method_Calls, AMethodTakesItsInParametersAndFillsTheRecord) {
     EXPECT_TRUE(null_in(call, "Ouint32"));
     put(call, "Ouint32", std::uint32_t{8});
     put(call, "return_value", std::uint32_t{9});
-    refer(call, "OPart", part("out").get());
+    refer(call, "OPart", part("new").get());
     return 0;
   };
   in_request([&] {
@@ -245,7 +245,7 @@ TEST_F(Method_Calls, AMethodTakesItsInParametersAndFillsTheRecord) {
     ASSERT_EQ(cimom::invoke_method(NS, all.get(), call.get()), 0);
     EXPECT_EQ(take<std::uint32_t>(call.get(), "Ouint32"), 8u);
     EXPECT_EQ(take<std::uint32_t>(call.get(), "return_value"), 9u);
-    EXPECT_EQ(take<String>(take<Instance*>(call.get(), "OPart"), "Id"), "out");
+    EXPECT_EQ(take<String>(take<Instance*>(call.get(), "OPart"), "Id"), "new");
     EXPECT_STREQ(call->__name_space.c_str(), NS);
   });
 }
