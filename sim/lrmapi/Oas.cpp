@@ -7,10 +7,9 @@ namespace {
 
 constexpr RM_STATUS not_supported = 2;
 
-RM_OASLunEntry record_of(const Oas_Entry& entry) {
+RM_OASLunEntry record_of(const Oas_Entry& entry, const Fault_Effect& effect) {
   RM_OASLunEntry record{};
-  const auto bytes = lun_bytes(entry.lun);
-  std::memcpy(record.fcpLun, bytes.data(), bytes.size());
+  write_text(record.fcpLun, sizeof record.fcpLun, std::to_string(entry.lun), effect);
   record.lun = static_cast<uint8_t>(entry.lun);
   record.state = entry.state;
   return record;
@@ -56,7 +55,7 @@ RM_STATUS LRM_GetOASLunList(HBA_WWN initiator, HBA_WWN, HBA_WWN target, uint32_t
         auto* out = reinterpret_cast<std::uint8_t*>(list->entry);
         for (const Oas_Entry& entry : port.oas) {
           if (entry.target != to_wwn(target) || entry.option != option) continue;
-          const RM_OASLunEntry record = record_of(entry);
+          const RM_OASLunEntry record = record_of(entry, effect);
           if (count < room) std::memcpy(out + count * sizeof record, &record, sizeof record);
           ++count;
         }

@@ -397,6 +397,7 @@ TEST_F(Management, OptimizedAccessIsKeptByTargetUnitAndOption) {
   EXPECT_EQ(list(1), RM_ERROR_MORE_DATA);
   EXPECT_EQ(count, 2u);
   EXPECT_EQ(list(1), 0);
+  EXPECT_STREQ(reinterpret_cast<char*>(&memory[4 + 36]), "4");
   EXPECT_EQ(memory[4 + 36 + 8], 4);
   EXPECT_EQ(memory[4 + 36 + 17], 1);
   EXPECT_EQ(list(0), 0);
