@@ -3,8 +3,6 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cstdlib>
-#include <filesystem>
 #include <mutex>
 #include <set>
 #include <string>
@@ -15,6 +13,7 @@
 #include "derivedObjects/Dispatcher.h"
 #include "derivedObjects/Skeleton_Provider.h"
 #include "schema/catalogue.h"
+#include "support/Temp_Root.h"
 
 namespace cimrt::test {
 namespace {
@@ -49,23 +48,13 @@ class Log_Record final : public TVX_LoggerInterface {
   std::multiset<Logged> _messages;
 };
 
-/// No adapter library can be opened below an empty root folder.
+/// No adapter library can be opened: none lies in the program's search path.
 class Skeleton : public testing::Test {
  protected:
-  void SetUp() override {
-    char name[] = "/tmp/tvx_skeleton_XXXXXX";
-    ASSERT_NE(mkdtemp(name), nullptr);
-    _root = name;
-    setenv("TVX_ROOT", name, 1);
-    getLogger().enable();
-  }
-  void TearDown() override {
-    unsetenv("TVX_ROOT");
-    std::filesystem::remove_all(_root);
-  }
+  Skeleton() { getLogger().enable(); }
 
  private:
-  std::filesystem::path _root;
+  tvx::test::Temp_Root _root;
 };
 
 const Provider_Entry& entry_named(const std::string& name) {
