@@ -44,22 +44,23 @@ RM_STATUS LRM_GetDriverType(HBA_WWN wwpn, uint32_t* type) {
                    });
 }
 
-// The block is the caller's, so neither the world nor its lock is needed; faults still apply.
+// The block is the caller's, so the world is not needed; faults apply. One that answers status 0
+// gives a success without a value.
 void* RM_GetAttributeValue(const void* block, uint32_t attribute, uint32_t* length,
                            RM_STATUS* status) {
-  const std::optional<Block_Value> value = find_in_block(block, attribute);
-  std::uint32_t told = value ? value->length : 0;
-  const RM_STATUS result = rm_call(Call_Site{.name = "RM_GetAttributeValue"},
-                                   [&](World&, const Fault_Effect& effect) -> RM_STATUS {
-                                     if (!value || effect.omitted.contains(attribute))
-                                       return RM_ERROR;
-                                     told = effect.returned_size.value_or(told);
-                                     return RM_OK;
-                                   });
+  Block_Value value{};
+  const RM_STATUS result =
+      rm_call(Call_Site{.name = "RM_GetAttributeValue"},
+              [&](World&, const Fault_Effect& effect) -> RM_STATUS {
+                const std::optional<Block_Value> found = find_in_block(block, attribute);
+                if (!found || effect.omitted.contains(attribute)) return RM_ERROR;
+                value = *found;
+                value.length = effect.returned_size.value_or(found->length);
+                return RM_OK;
+              });
   if (status != nullptr) *status = result;
-  if (result != RM_OK) return nullptr;
-  if (length != nullptr) *length = told;
-  return const_cast<void*>(value->data);
+  if (length != nullptr && result == RM_OK) *length = value.length;
+  return const_cast<void*>(value.data);
 }
 
 }  // extern "C"

@@ -52,8 +52,8 @@ Bytes text_value(std::string_view text);
 std::size_t write_block(const Attribute_Map& values, void* buffer, std::size_t room);
 
 struct Block_Value {
-  const void* data;
-  std::uint32_t length;
+  const void* data = nullptr;
+  std::uint32_t length = 0;
 };
 
 /// Finds an attribute in a block written by `write_block`. Nothing if it is absent or `block` is

@@ -23,8 +23,8 @@ struct Registrations {
 };
 
 Registrations& registrations() {
-  static Registrations instance;
-  return instance;
+  static auto* const instance = new Registrations;  // as long as the process
+  return *instance;
 }
 
 }  // namespace

@@ -110,7 +110,7 @@ void read_vports(const Json_Reader& reader, Port& port) {
     vport.fc_id = item.number<std::uint32_t>(
         "fc_id", port.fc_id + 1 + static_cast<std::uint32_t>(port.vports.size()));
     vport.name = item.text("name", "vport" + std::to_string(port.vports.size()));
-    const auto count = item.number<std::uint32_t>("count", 1);
+    const auto count = item.number<std::uint16_t>("count", 1);
     item.finish();
     for (std::uint32_t i = 0; i < count; ++i) {
       port.vports.push_back(vport);

@@ -151,7 +151,7 @@ void read_flash(const Json_Reader& reader, const Card& card, Port& port) {
     entry.type = item.text("type", {});
     entry.version = item.text("version", {});
     entry.wakeup = item.flag("wakeup", false);
-    const auto count = item.number<std::uint32_t>("count", 1);
+    const auto count = item.number<std::uint8_t>("count", 1);
     item.finish();
     port.flash.insert(port.flash.end(), count, entry);
   }

@@ -51,8 +51,9 @@ void complete(Call_Site& site, World& world) {
 }  // namespace
 
 Simulation& Simulation::instance() {
-  static Simulation simulation;
-  return simulation;
+  // Never destroyed: other threads may still call while the process ends.
+  static Simulation* const simulation = new Simulation;
+  return *simulation;
 }
 
 void Simulation::refresh() {

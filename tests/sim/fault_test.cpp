@@ -93,6 +93,17 @@ TEST_F(Faults, ALengthMayBeOverlong) {
   EXPECT_EQ(block.length(RM_HA_MODEL_ID), 9999u);
 }
 
+TEST_F(Faults, AnAttributeMayBeASuccessWithoutAValue) {
+  Block block(rm);
+  ASSERT_EQ(SIM_CALL(rm, LRM_GetHBAAttributes, first_port, block.data(), &block.size), 0);
+  fault(R"({"call": "RM_GetAttributeValue", "status": 0})");
+  RM_STATUS status = 1;
+  std::uint32_t length = 0;
+  EXPECT_EQ(SIM_CALL(rm, RM_GetAttributeValue, block.data(), RM_HA_MODEL_ID, &length, &status),
+            nullptr);
+  EXPECT_EQ(status, 0);
+}
+
 TEST_F(Faults, TextsMayLackTheirEnd) {
   fault(R"({"call": "HBA_GetAdapterAttributes", "unterminated_texts": true})");
   const HBA_HANDLE handle = open("Torvex-TVX16002-1");

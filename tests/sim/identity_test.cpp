@@ -14,6 +14,7 @@ std::string adapter_name(const Library& hba, HBA_UINT32 index) {
 
 TEST_F(Identity, EachPortIsAnAdapterAndTheConvergedCardIsShownToo) {
   EXPECT_EQ(SIM_CALL(hba, HBA_LoadLibrary), 0u);
+  EXPECT_EQ(hba.entry<HBA_UINT32()>("HBA_GetVersion")(), 2u);
   ASSERT_EQ(SIM_CALL(hba, HBA_GetNumberOfAdapters), 5u);
   EXPECT_EQ(adapter_name(hba, 0), "Torvex-TVX16002-1");
   EXPECT_EQ(adapter_name(hba, 1), "Torvex-TVX16002-2");
