@@ -1,3 +1,4 @@
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <pthread.h>
 #include <sys/resource.h>
@@ -5,7 +6,6 @@
 #include <csignal>
 #include <cstdio>
 #include <cstring>
-#include <regex>
 #include <string>
 
 #include "common/CLogger.h"
@@ -49,10 +49,11 @@ TEST_F(Log_Backends, WritesALineWithThreadTimePlaceLevelAndText) {
   std::snprintf(thread, sizeof thread, "[threadid =%ul]", static_cast<unsigned>(::pthread_self()));
   const std::string text = root.read(LOG);
   EXPECT_EQ(text.substr(0, std::strlen(thread)), thread);
-  EXPECT_TRUE(std::regex_match(text.substr(std::strlen(thread)),
-                               std::regex(R"( \[\d{4}/\d\d/\d\d \d\d:\d\d:\d\d\.\d{6}[+-]\d{3}\] )"
-                                          R"(\[some/File\.cpp:17\]\[TVX_WARN\] hello %d\n)")))
-      << text;
+  EXPECT_THAT(
+      text.substr(std::strlen(thread)),
+      testing::MatchesRegex(
+          " \\[[0-9]{4}/[0-9]{2}/[0-9]{2} [0-9]{2}:[0-9]{2}:[0-9]{2}\\.[0-9]{6}[+-][0-9]{3}\\] "
+          "\\[some/File\\.cpp:17\\]\\[TVX_WARN\\] hello %d\n"));
 }
 
 TEST_F(Log_Backends, WritesInModesTwoAndFourOnly) {
