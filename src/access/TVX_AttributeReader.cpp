@@ -10,9 +10,13 @@ namespace cimrt {
 
 namespace {
 
-constexpr std::size_t MAX_TEXT = 255;
+constexpr std::size_t MAX_TEXT = 255;  // no reader takes more than this of one value
 
 }  // namespace
+
+TVX_Block allocateAttributeBlock(std::uint32_t size) {
+  return tvxAllocate(std::size_t{size} + MAX_TEXT + 1);
+}
 
 TVX_Attribute findAttribute(const void* block, std::uint32_t key) {
   TVX_Attribute attribute;

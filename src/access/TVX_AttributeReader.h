@@ -4,14 +4,19 @@
 #include <cstdint>
 #include <string>
 
+#include "common/TVX_Memory.h"
 #include "rmapi/rmapi.h"
 
 namespace cimrt {
 
+/// A zeroed attribute block for a library that is told `size`: a value that claims to reach over
+/// the block's end can still be read by the readers below. Null when memory ran out.
+TVX_Block allocateAttributeBlock(std::uint32_t size);
+
 /// Where the value of one attribute lies in its block, as the library told.
 struct TVX_Attribute {
   const std::uint8_t* value = nullptr;  ///< null if the attribute could not be read
-  std::uint32_t length = 0;             ///< bytes
+  std::uint32_t length = 0;             ///< bytes, as the library claims
   RM_STATUS status = RM_ERROR;          ///< 0 if it could
 };
 

@@ -281,7 +281,7 @@ RM_STATUS TVX_MethodWrapper::getTargetOS_info(const char* name, char* osInfo) {
   if (osInfo == nullptr) return RM_ERROR_INVALID_POINTER;
   HBA_WWN wwn{};
   if (const RM_STATUS status = deviceIdToWWN(&wwn, name); status != RM_OK) return status;
-  const TVX_Block block = tvxAllocate(RM_SERVER_ATTRIBUTES_SIZE);
+  const TVX_Block block = allocateAttributeBlock(RM_SERVER_ATTRIBUTES_SIZE);
   if (block == nullptr) {
     TVX_LOG(TVX_ERR, "ERROR: TVX_MethodWrapper::getTargetOS_info: Unable to allocate buffer");
     return RM_ERROR_NO_MEMORY;

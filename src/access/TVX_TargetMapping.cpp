@@ -197,7 +197,7 @@ RM_STATUS TVX_MethodWrapper::tvxcimGetTargetMapping(const char* initiatorId, con
   path.lun = lun;
   if (deviceIdToWWN(&path.initiator, initiatorId) != RM_OK) return RM_ERROR;
   if (deviceIdToWWN(&path.target, targetId) != RM_OK) return RM_ERROR;
-  TVX_Block block = tvxAllocate(RM_LUN_ATTRIBUTES_SIZE);
+  TVX_Block block = allocateAttributeBlock(RM_LUN_ATTRIBUTES_SIZE);
   if (block == nullptr) {
     TVX_LOG(TVX_CRIT, "Could not allocate memory for Lun Attribute");
     return RM_ERROR;

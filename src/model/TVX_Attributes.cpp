@@ -23,7 +23,7 @@ std::string wwnText(const HBA_WWN& wwn) {
 }
 
 TVX_Block allocateBlock(std::uint32_t size) {
-  TVX_Block block = tvxAllocate(size);
+  TVX_Block block = allocateAttributeBlock(size);
   if (block == nullptr) throw std::exception();
   return block;
 }

@@ -60,7 +60,7 @@ void readCounter(const void* block, std::uint32_t identifier, std::uint64_t& cou
 
 FCPortStatistics::FCPortStatistics(const std::string& portName) {
   m_Counters.fill(NOT_SUPPLIED);
-  const TVX_Block block = tvxAllocate(RM_PORT_STATISTICS_SIZE);
+  const TVX_Block block = allocateAttributeBlock(RM_PORT_STATISTICS_SIZE);
   if (block == nullptr) throw std::exception();
   std::uint32_t length = RM_PORT_STATISTICS_SIZE;
   const RM_STATUS status = LRM_GetPortStatistics(portNameToWWN(portName), block.get(), &length);

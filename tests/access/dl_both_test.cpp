@@ -1,6 +1,9 @@
 // The present library names.
 #include <gtest/gtest.h>
 
+#include <thread>
+#include <vector>
+
 #include "access/TVX_Runtime_Loader.h"
 #include "support/Log_Capture.h"
 
@@ -33,6 +36,24 @@ TEST(Loader_With_Libraries, CanBeLoadedAgain) {
     EXPECT_EQ(cimrt::UnloadRuntimeLibraries(), 0);
     EXPECT_EQ(cimrt::runtimeLibraryHandle(cimrt::TVX_SLOT_LRMAPI), nullptr);
   }
+}
+
+TEST(Loader_With_Libraries, StubsMayBeCalledFromManyThreads) {
+  ASSERT_EQ(cimrt::LoadRuntimeLibraries(), 0);
+  std::vector<std::thread> threads;
+  for (std::uint8_t number = 0; number < 4; ++number) {
+    threads.emplace_back([number] {
+      for (int i = 0; i < 500; ++i) {
+        std::uint32_t type = 0;
+        EXPECT_EQ(cimrt::LRM_GetDriverType(HBA_WWN{{0, 0, 0, 0, 0, 0, 0, number}}, &type), 0);
+        EXPECT_EQ(type, number);
+        EXPECT_EQ(cimrt::HBA_GetNumberOfAdapters(), 3U);
+        EXPECT_EQ(cimrt::LRM_ResetHBA(HBA_WWN{}, 1), 1);
+      }
+    });
+  }
+  for (std::thread& thread : threads) thread.join();
+  EXPECT_EQ(cimrt::UnloadRuntimeLibraries(), 0);
 }
 
 }  // namespace
