@@ -1,0 +1,125 @@
+// Many readers, refreshes and reloads at once. What each test says holds in any build; under
+// ThreadSanitizer it also shows that nothing is touched without its lock.
+#include <atomic>
+#include <thread>
+#include <vector>
+
+#include "Agent_Fixture.h"
+
+namespace cimrt::test {
+namespace {
+
+constexpr std::uint64_t MINUTE = 60'000'000;
+
+class Concurrency : public Agent_Test {
+ protected:
+  void SetUp() override {
+    Agent_Test::SetUp();
+    useScenario(singlePortCards(2));
+  }
+};
+
+/// Reads every form once. Counts the answers that are neither empty nor whole.
+void readAll(ProviderAgent& agent, std::atomic<int>& mixtures) {
+  Delivered ports;
+  agent.enumInstances(agent.m_TVXHBA_FCPort_map, ports.handler());
+  Delivered live;
+  agent.enumActiveInstances(
+      agent.m_TVXHBA_FCPortStatistics_map, live.handler(), [](ProviderAgent& a) {
+        for (std::size_t i = 0; i < a.m_TVXHBA_FCPortStatistics_map.size(); i++)
+          a.m_TVXHBA_FCPortStatistics_map[i]->LinkFailures.set(i);
+      });
+  Delivered volumes;
+  agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, volumes.handler());
+  if (ports.size() != 2 || live.size() != 2) mixtures++;
+}
+
+TEST_F(Concurrency, ReadersOfAllFormsDuringRefreshes) {
+  ProviderAgent& agent = startAgent();
+  std::atomic<int> mixtures{0};
+  std::atomic<bool> stop{false};
+  std::vector<std::thread> readers;
+  for (int i = 0; i < 2; i++)
+    readers.emplace_back([&] {
+      while (!stop) readAll(agent, mixtures);
+    });
+  for (int run = 0; run < 5; run++) {
+    turnClock(11 * MINUTE);
+    agent.BuildCimrtInfo();
+    awaitIdle(agent);
+  }
+  stop = true;
+  for (std::thread& reader : readers) reader.join();
+  awaitIdle(agent);
+  EXPECT_EQ(mixtures, 0);
+  EXPECT_GE(log.count("PERF: Building Adapter Data..."), 5u);
+}
+
+TEST_F(Concurrency, SANReadersWithoutSANRefreshAllComeBack) {
+  ProviderAgent& agent = startAgent();
+  agent.m_bSANRefreshSetting = false;
+  std::atomic<int> served{0};
+  std::vector<std::thread> readers;
+  for (int i = 0; i < 3; i++)
+    readers.emplace_back([&] {
+      for (int read = 0; read < 5; read++) {
+        Delivered volumes;
+        agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, volumes.handler());
+        served++;
+        turnClock(11 * MINUTE);  // the next read finds an old cache
+      }
+    });
+  for (std::thread& reader : readers) reader.join();
+  awaitIdle(agent);
+  EXPECT_EQ(served, 15);
+}
+
+TEST_F(Concurrency, LoadsAndUnloadsWhileOthersRead) {
+  std::atomic<int> wrong{0};
+  std::vector<std::thread> providers;
+  for (int i = 0; i < 3; i++)
+    providers.emplace_back([&] {
+      for (int life = 0; life < 4; life++) {
+        if (ProviderAgent::acquire() != LOAD_OK) wrong++;
+        ProviderAgent& agent = *ProviderAgent::getInstance();
+        Delivered ports;
+        agent.enumInstances(agent.m_TVXHBA_FCPort_map, ports.handler());
+        if (ports.size() != 2) wrong++;
+        ProviderAgent::releaseRef();
+      }
+    });
+  for (std::thread& provider : providers) provider.join();
+  EXPECT_EQ(wrong, 0);
+  EXPECT_EQ(ProviderAgent::refCount(), 0u);
+}
+
+TEST_F(Concurrency, UnloadsInTheMiddleOfRunsJoinThem) {
+  for (int life = 0; life < 5; life++) {
+    ASSERT_EQ(ProviderAgent::acquire(), LOAD_OK);
+    ProviderAgent::getInstance()->BuildCimrtInfo();
+    ProviderAgent::releaseRef();
+  }
+  EXPECT_EQ(ProviderAgent::refCount(), 0u);
+}
+
+TEST_F(Concurrency, WritersAndReadersShareTheSettings) {
+  ProviderAgent& agent = startAgent();
+  std::atomic<bool> stop{false};
+  std::atomic<int> mixtures{0};
+  std::thread reader([&] {
+    while (!stop) readAll(agent, mixtures);
+  });
+  for (int i = 0; i < 20; i++) {
+    agent.awaitAdapterMaps();
+    Ranked_Lock data(agent.m_DataMutex);
+    agent.m_CacheTimeout = 5 + static_cast<std::uint32_t>(i % 5);
+    agent.m_bSANRefreshSetting = i % 2 == 0;
+    agent.m_TVXHBA_FCPort_map[0]->LocationIndicator.set(2 + i % 2);
+  }
+  stop = true;
+  reader.join();
+  EXPECT_EQ(mixtures, 0);
+}
+
+}  // namespace
+}  // namespace cimrt::test
