@@ -1,0 +1,68 @@
+// Load, serve, clean up, unload and load again, in one process.
+#include <thread>
+
+#include "Provider_Fixture.h"
+#include "tvxsim/tvxsim.h"
+
+namespace tvx::test {
+namespace {
+
+using Lifecycle = Provider_Test;
+
+TEST_F(Lifecycle, LibraryServesAndLeavesAgainAndAgain) {
+  for (int life = 0; life < 3; life++) {
+    load();
+    EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+    EXPECT_EQ(instances("TVXHBA_Card").size(), 2u);
+    EXPECT_EQ(broker->unload().rc, CMPI_RC_OK);
+    EXPECT_FALSE(broker->stillMapped(TVX_PROVIDER_LIBRARY)) << "life " << life;
+    broker.reset();
+  }
+  EXPECT_EQ(tvxsim_open_handles(), 0u);
+}
+
+TEST_F(Lifecycle, ClassesComeAndGoWhileOthersStay) {
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+  EXPECT_EQ(instances("TVXHBA_Card").size(), 2u);
+  EXPECT_EQ(broker->cleanup("TVXHBA_FCPort", host::InterfaceKind::Instance, false).rc, CMPI_RC_OK);
+  const unsigned long calls = tvxsim_calls("LRM_InitLib", nullptr);
+  EXPECT_EQ(instances("TVXHBA_Card").size(), 2u);
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+  EXPECT_EQ(tvxsim_calls("LRM_InitLib", nullptr), calls) << "the agent stayed all the time";
+}
+
+TEST_F(Lifecycle, UnloadRightBehindAReadJoinsTheRefresh) {
+  for (int life = 0; life < 3; life++) {
+    useScenario();
+    // The reader has its answer when the adapter maps are ready; the scan of the SAN goes on.
+    addFault(R"({"call": "HBA_GetFcpTargetMapping", "delay_ms": 5})");
+    load();
+    EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+    unload();
+    EXPECT_EQ(tvxsim_open_handles(), 0u);
+  }
+}
+
+TEST_F(Lifecycle, RefusedInitialisationAnswersEveryClassEmpty) {
+  addFault(R"({"call": "LRM_InitLib", "status": 1})");
+  load();
+  for (const char* name : {"TVXHBA_FCPort", "TVXHBA_Card", "TVXHBA_StorageVolume"})
+    EXPECT_TRUE(instances(name).empty()) << name;
+  unload();
+  // The next life is a healthy one.
+  useScenario();
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+}
+
+TEST_F(Lifecycle, SettingsFileIsMadeAtUnload) {
+  load();
+  instances("TVXHBA_Card");
+  EXPECT_FALSE(std::filesystem::exists(root / "etc/torvex_fc_provider.conf"));
+  unload();
+  EXPECT_TRUE(std::filesystem::exists(root / "etc/torvex_fc_provider.conf"));
+}
+
+}  // namespace
+}  // namespace tvx::test
