@@ -39,7 +39,7 @@ def generate(classes, served, maps, servings, output):
     emit_module.registrations(output, classes, served, servings, maps)
     emit_module.factories(output, classes, served)
     emit_module.exports(output, classes, served)
-    emit_host.class_data(output, classes, set(served))
+    emit_host.class_data(output, classes, set(served), servings)
 
 
 def main(words=None):

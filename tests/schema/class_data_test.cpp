@@ -96,12 +96,17 @@ TEST(HostClassData, AgreesWithTheProvidersMetaData) {
   }
 }
 
+/// Profiles and the references between them are looked for in the interop namespace.
+const std::set<std::string> interop_classes = {
+    "TVXHBA_RegisteredProfile", "TVXHBA_ReferencedProfile", "TVXHBA_BaseServerReferencedProfile"};
+
 TEST(HostClassData, MarksTheServedClassesWithTheirNamespace) {
   std::set<std::string> served, expected;
   for (const Catalogue_Row& row : catalogue) expected.insert(row.name);
   for (const ClassData& data : classes()) {
     if (data.isServed) served.insert(data.name);
-    EXPECT_STREQ(data.nameSpace, data.isServed ? "root/torvex" : nullptr) << data.name;
+    const char* own = interop_classes.contains(data.name) ? "root/pg_interop" : "root/torvex";
+    EXPECT_STREQ(data.nameSpace, data.isServed ? own : nullptr) << data.name;
   }
   EXPECT_EQ(served, expected);
 }

@@ -205,7 +205,7 @@ class GeneratorTest(unittest.TestCase):
         self.put("derived/providers.txt", "CIM_Thing services/None.h\n")
         self.expect_error("providers.txt:1", "there is no header 'services/None.h'")
         self.put("derived/providers.txt", "CIM_Thing slow\n")
-        self.expect_error("providers.txt:1", "expected 'san' or a header, found 'slow'")
+        self.expect_error("providers.txt:1", "expected 'san', 'interop' or a header, found 'slow'")
 
     def test_touches_only_what_changes(self):
         output = self.folder / "out"

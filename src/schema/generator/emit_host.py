@@ -4,6 +4,7 @@ from .class_model import ROOT
 from .writer import Pool, braces
 
 NAME_SPACE = "root/torvex"
+INTEROP_NAME_SPACE = "root/pg_interop"
 
 
 def text(value):
@@ -28,7 +29,14 @@ def feature(variable):
             f"{text(target)}, {text(variable.default)}, {text(variable.origin)}}}")
 
 
-def class_data(output, classes, served):
+def name_space(cls, served, servings):
+    """Where the class's instances live; None if nothing here serves it."""
+    if cls.name not in served:
+        return None
+    return INTEROP_NAME_SPACE if cls.name in servings and servings[cls.name].interop else NAME_SPACE
+
+
+def class_data(output, classes, served, servings):
     features, methods = Pool(), Pool()
     rows = []
     for cls in classes.values():
@@ -42,9 +50,9 @@ def class_data(output, classes, served):
         bools = ("Association" in cls.qualifiers, "Aggregation" in cls.qualifiers, "Abstract" in cls.qualifiers,
                  "Indication" in cls.qualifiers, cls.name in served)
         rows.append(f"{{{text(cls.name)}, {text(cls.super_class.name if cls.super_class else None)}, "
-                    f"{', '.join(truth(b) for b in bools)}, {text(NAME_SPACE if cls.name in served else None)}, "
+                    f"{', '.join(truth(b) for b in bools)}, {text(name_space(cls, served, servings))}, "
                     f"&features[{feature_start}], {len(cls.variables)}, &methods[{method_start}], {len(cls.methods)}}}")
-    output.write("host_class_data.cpp", "src/schema/*.mof", f"""#include "cmpi/cmpidt.h"
+    output.write("host_class_data.cpp", "src/schema/*.mof and src/derivedObjects/providers.txt", f"""#include "cmpi/cmpidt.h"
 #include "schema/ClassData.h"
 
 namespace tvx::host {{

@@ -13,6 +13,7 @@ MODULE_NAME = "torvex_fc_provider_Module"
 class Serving:
     """How a class is served."""
     san: bool = False
+    interop: bool = False
     header: str = None
 
 
@@ -27,14 +28,14 @@ def read_providers(path, served):
             raise SchemaError(where, f"'{name}' is named twice")
         serving = servings[name] = Serving()
         for word in words[1:]:
-            if word == "san":
-                serving.san = True
+            if word in ("san", "interop"):
+                setattr(serving, word, True)
             elif word.endswith(".h"):
                 if not (path.parent.parent / word).is_file():
                     raise SchemaError(where, f"there is no header '{word}'")
                 serving.header = word
             else:
-                raise SchemaError(where, f"expected 'san' or a header, found '{word}'")
+                raise SchemaError(where, f"expected 'san', 'interop' or a header, found '{word}'")
     return servings
 
 
