@@ -191,12 +191,11 @@ TEST_F(Refresh, SANReaderIsServedThoughARunMakesItsMapsStaleOnTheWay) {
   agent.m_bSANRefreshSetting = false;
   // The reader may find ready maps, ask for nothing, and see them go stale by the run that its own
   // call starts. It must come back all the same; the test's time limit says so.
-  for (int read = 0; read < 50; read++) {
+  while (log.count(ADAPTER_DATA) < 10) {
     Delivered delivered;
     agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, delivered.handler());
   }
   awaitIdle(agent);
-  EXPECT_GE(log.count(ADAPTER_DATA), 2u);
   EXPECT_GE(log.count(SAN_MAPS), 1u);
 }
 
