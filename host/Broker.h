@@ -58,6 +58,8 @@ struct BrokerOptions {
   /// and requests reach exactly the class that they name. Must outlive the broker.
   const ClassCatalogue* classes = nullptr;
   std::string nameSpace = "root/torvex";
+  /// Namespaces that exist besides those of the classes and of the foreign instances.
+  std::vector<std::string> moreNameSpaces = {"root/pg_interop"};
   /// Text of the context entry CMPIPrincipal; nothing makes a string object without text.
   std::optional<std::string> user = "root";
 };

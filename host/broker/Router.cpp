@@ -67,7 +67,10 @@ bool Broker::Impl::knowsClass(const std::string& className) const {
 
 Status Broker::Impl::checkPlace(const Request& request) const {
   const std::string& nameSpace = request.path.nameSpace;
-  const bool knownPlace = nameSpace.empty() || options.classes == nullptr ||
+  const auto& more = options.moreNameSpaces;
+  const bool isMore = std::any_of(
+      more.begin(), more.end(), [&](const std::string& each) { return sameName(each, nameSpace); });
+  const bool knownPlace = isMore || nameSpace.empty() || options.classes == nullptr ||
                           options.classes->knowsNameSpace(nameSpace) ||
                           sameName(nameSpace, options.nameSpace) || store.knowsNameSpace(nameSpace);
   if (!knownPlace) {

@@ -1,40 +1,23 @@
 // The program as people and scripts run it: output, errors and exit codes.
 #include <gtest/gtest.h>
-#include <sys/wait.h>
 #include <unistd.h>
 
-#include <cstdio>
 #include <fstream>
 #include <nlohmann/json.hpp>
 #include <regex>
 
+#include "Run_Program.h"
 #include "cli/ExitCode.h"
 
 namespace tvx::host {
 namespace {
 
-struct Outcome {
-  int exitCode;
-  std::string out;
-  std::string err;
-};
+using test::Outcome;
 
-std::string readAndRemove(const std::string& file) {
-  std::ifstream stream(file);
-  std::string text((std::istreambuf_iterator<char>(stream)), {});
-  unlink(file.c_str());
-  return text;
-}
-
-/// Runs the program over the test classes in a shell.
+/// Runs the program over the test classes.
 Outcome run(const std::string& words, bool withLibrary = true) {
-  const std::string base = testing::TempDir() + "tvxcim-run-" + std::to_string(getpid());
-  const std::string command = std::string(TVXCIM_FAKE) +
-                              (withLibrary ? " --lib " FAKE_PROVIDER " " : " ") + words + " >" +
-                              base + ".out 2>" + base + ".err";
-  const int status = std::system(command.c_str());
-  return {WIFEXITED(status) ? WEXITSTATUS(status) : -1, readAndRemove(base + ".out"),
-          readAndRemove(base + ".err")};
+  return test::runShell(std::string(TVXCIM_FAKE) +
+                        (withLibrary ? " --lib " FAKE_PROVIDER " " : " ") + words);
 }
 
 nlohmann::json jsonOf(const Outcome& result) {
