@@ -49,15 +49,16 @@ RM_STATUS LRM_GetDriverType(HBA_WWN wwpn, uint32_t* type) {
 void* RM_GetAttributeValue(const void* block, uint32_t attribute, uint32_t* length,
                            RM_STATUS* status) {
   Block_Value value{};
-  const RM_STATUS result =
-      rm_call(Call_Site{.name = "RM_GetAttributeValue"},
-              [&](World&, const Fault_Effect& effect) -> RM_STATUS {
-                const std::optional<Block_Value> found = find_in_block(block, attribute);
-                if (!found || effect.omitted.contains(attribute)) return RM_ERROR;
-                value = *found;
-                value.length = effect.returned_size.value_or(found->length);
-                return RM_OK;
-              });
+  const RM_STATUS result = rm_call(Call_Site{.name = "RM_GetAttributeValue"},
+                                   [&](World&, const Fault_Effect& effect) -> RM_STATUS {
+                                     const std::optional<Block_Value> found =
+                                         find_in_block(block, attribute);
+                                     if (!found || effect.omitted.contains(attribute))
+                                       return RM_ERROR;
+                                     value = *found;
+                                     value.length = effect.returned_size.value_or(found->length);
+                                     return RM_OK;
+                                   });
   if (status != nullptr) *status = result;
   if (length != nullptr && result == RM_OK) *length = value.length;
   return const_cast<void*>(value.data);

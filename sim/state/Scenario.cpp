@@ -58,7 +58,8 @@ void read_defaults(const Json_Reader& scenario) {
 
 void read_library(const Json_Reader& scenario, Library_Texts& library) {
   library.mili_version = "5.2.18.4";
-  library.versions = {{0, "5.2.18.4"}, {1, "5.2.18.4"}};
+  // By the selectors of the management library and of the library below it.
+  library.versions = {{0x66, "5.2.18.4"}, {0x68, "5.2.9.1"}};
   library.os_info = "Linux 6.1.0-18-amd64";
   const std::optional<Json_Reader> texts = scenario.object("library");
   if (!texts) return;

@@ -142,9 +142,11 @@ TEST_F(Identity, DriverTypeVersionsAndStatusTexts) {
   EXPECT_STREQ(text, "5.2.18.4");
   EXPECT_EQ(SIM_CALL(rm, RM_MiliVersion, text, 4u), RM_ERROR_VERSION_TOO_SMALL);
   std::uint32_t size = 4;
-  EXPECT_EQ(SIM_CALL(rm, RM_GetVersion, 1, text, &size), RM_ERROR_VERSION_TOO_SMALL);
+  EXPECT_EQ(SIM_CALL(rm, RM_GetVersion, 0x66, text, &size), RM_ERROR_VERSION_TOO_SMALL);
   EXPECT_EQ(size, 9u);
-  EXPECT_EQ(SIM_CALL(rm, RM_GetVersion, 1, text, &size), 0);
+  EXPECT_EQ(SIM_CALL(rm, RM_GetVersion, 0x66, text, &size), 0);
+  EXPECT_STREQ(text, "5.2.18.4");
+  EXPECT_NE(SIM_CALL(rm, RM_GetVersion, 3, text, &size), 0);
   EXPECT_EQ(SIM_CALL(rm, RM_StatusString, 148, text, 64u), 0);
   EXPECT_STREQ(text, "Mailbox command failed");
   EXPECT_EQ(SIM_CALL(rm, RM_StatusString, 12345, text, 64u), 0);
