@@ -156,15 +156,10 @@ constexpr Steps association_steps() {
   return steps;
 }
 
-/// True for an operation that works without a provider object.
-constexpr bool needs_no_provider(std::uint32_t operation) {
-  return operation <= OPERATION_DESTROY_PROVIDER || operation == OPERATION_GET_REPOSITORY;
-}
-
 std::int32_t dispatch(const Steps& steps, const Registration* registration, std::uint32_t operation,
                       const std::array<void*, NUM_ARGUMENTS>& values) {
   if (operation >= NUM_OPERATIONS || !steps[operation]) return NO_OPERATION;
-  if (!values[0] && !needs_no_provider(operation)) return NO_OPERATION;
+  if (!values[0] && operation != OPERATION_DESTROY_PROVIDER) return NO_OPERATION;
   return steps[operation](static_cast<const Provider_Entry&>(*registration), Arguments(values));
 }
 

@@ -8,7 +8,8 @@ namespace cimrt {
 /// The three shapes of an entry. Each takes a registration that is a `Provider_Entry`, and answers
 /// the status of the operation, or -1 for an operation that the shape does not have: methods for
 /// `plain_proc` and `association_proc`, association operations for `plain_proc` and `method_proc`,
-/// indications and unknown codes for all. -1 also answers a call without a provider object.
+/// indications and unknown codes for all. -1 also answers a call whose first argument, the provider
+/// object or the place of a result, is null; only destroying no provider is fine.
 ///
 /// An enumerating operation makes one last call of the handler, with a null instance and the
 /// status, after the provider has returned; an association operation that the provider does not

@@ -47,9 +47,8 @@ class Served_Classes : public testing::Test {
 
   /// How many of the objects the broker can fetch; the host and its chassis are other providers'.
   std::size_t fetchable(const std::vector<ObjectPath>& paths) {
-    return static_cast<std::size_t>(std::ranges::count_if(paths, [&](const ObjectPath& path) {
-      return data(path.className.c_str()).isServed;
-    }));
+    return static_cast<std::size_t>(std::ranges::count_if(
+        paths, [&](const ObjectPath& path) { return data(path.className.c_str()).isServed; }));
   }
 
   static void expect(const Reply& reply, int rc, const char* operation) {

@@ -1,11 +1,10 @@
 """Constant meta data of all classes: a few big tables that need no code to be built."""
 
 from . import cpp_types
-from .class_model import ROOT
 from .mof_reader import TYPES
 from .writer import Pool, braces
 
-TYPE_CODE = {name: code for code, name in enumerate(TYPES)}
+# Names of the type codes in the runtime.
 CODE_NAME = {name: name.upper() for name in TYPES}
 FLAG_OF_QUALIFIER = {
     "Abstract": "ABSTRACT", "Aggregate": "AGGREGATE", "Aggregation": "AGGREGATION", "Association": "ASSOCIATION",
