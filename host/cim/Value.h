@@ -86,7 +86,10 @@ class Value {
       std::variant<std::monostate, bool, std::uint64_t, std::int64_t, double, std::string,
                    std::shared_ptr<const ObjectPath>, std::shared_ptr<const Instance>, List>;
 
-  Value(CMPIType type, Data data) : m_Type(type), m_bNull(false), m_Data(std::move(data)) {}
+  /// Holds `data` as what it is, without a detour over another variant.
+  template <class T>
+  Value(CMPIType type, T data)
+      : m_Type(type), m_bNull(false), m_Data(std::in_place_type<T>, std::move(data)) {}
   template <class T>
   const T& get(const char* wanted) const;
 
