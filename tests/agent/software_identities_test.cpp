@@ -5,6 +5,7 @@
 #include "agent/RegisteredProfiles.h"
 #include "agent/SoftwareIdentities.h"
 #include "common/TVX_Clock.h"
+#include "model/TVX_Data.h"
 
 namespace cimrt::test {
 namespace {
@@ -97,6 +98,22 @@ TEST_F(Software_Identities, LibraryVersionsThatCannotBeReadStayNull) {
   EXPECT_TRUE(identity->LibRMAPIVersion.is_null());
   EXPECT_EQ(log.count("Failed to get LibDFCVersion: returned with error - 9"), 1u);
   EXPECT_EQ(log.count("Failed to get LibRMAPIVersion: returned with error - 9"), 1u);
+}
+
+TEST_F(Software_Identities, TargetSystemIsReadThroughTheFirstPort) {
+  const std::string ports = R"("cards": [{"ports": [{"wwpn": "10:00:00:00:00:00:00:01"}]}]})";
+  ProviderAgent& agent = build(R"({"library": {"os_info": "Linux 6.1.0"}, )" + ports);
+  const Identity* identity = find(agent, PROVIDER);
+  ASSERT_NE(identity, nullptr);
+  EXPECT_EQ(textsOf(identity->TargetOperatingSystems), (std::vector<std::string>{"Linux 6.1.0"}));
+  EXPECT_EQ(numbersOf(identity->TargetOSTypes), (std::vector<std::uint16_t>{36}));
+  // A text that fills the buffer of 40 characters has no end of its own.
+  useScenario(R"({"library": {"os_info": "0123456789012345678901234567890123456789ABC"}, )" +
+              ports);
+  refresh(agent);
+  EXPECT_EQ(textsOf(find(agent, PROVIDER)->TargetOperatingSystems),
+            (std::vector<std::string>{"0123456789012345678901234567890123456789"}));
+  EXPECT_EQ(numbersOf(find(agent, PROVIDER)->TargetOSTypes), (std::vector<std::uint16_t>{1}));
 }
 
 TEST_F(Software_Identities, TargetSystemThatCannotBeReadStaysNull) {
@@ -197,6 +214,32 @@ TEST_F(Software_Identities, DriverAndDiagnosticsOfManyPortsExistOnce) {
             1u);
   EXPECT_EQ(log.count(REFUSED), 0u);
   EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 3u);
+}
+
+/// An adapter of another kind.
+class Other_Adapter : public Adapter {
+ public:
+  Other_Adapter() : Adapter("Other-1", 7, 2) {}
+  const std::string& getName() const override { return m_Name; }
+  const std::int32_t& getNumber() const override { return m_Number; }
+  const std::uint32_t& getFunctionType() const override { return m_FunctionType; }
+  AdapterAttributes* getAttributes() override { return nullptr; }
+  AdapterStatistics* getStatistics() override { return nullptr; }
+  std::size_t getNumberOfPorts() override { return 0; }
+  std::vector<Port*>& getPorts() override { return m_Ports; }
+  Port* getPort(int) override { throw std::out_of_range("no port"); }
+  void rescanTargets() override {}
+};
+
+TEST_F(Software_Identities, AdapterOfAnotherKindHasNoDriver) {
+  ProviderAgent& agent = build(plainPort());
+  const std::size_t before = agent.m_TVXHBA_SoftwareIdentity_map.size();
+  agent.m_pData->m_Adapters.push_back(new Other_Adapter);
+  Host_Build host{agent};
+  EXPECT_EQ(CreateDriverIdentity(host), 0);
+  EXPECT_EQ(log.count("Skippping Adapter [Other-1] since it is not an FC Adapter"), 1u);
+  EXPECT_EQ(agent.m_TVXHBA_SoftwareIdentity_map.size(), before);
+  EXPECT_EQ(host.driverIdentity, find(agent, DRIVER));
 }
 
 TEST_F(Software_Identities, Firmware) {
