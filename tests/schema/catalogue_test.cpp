@@ -112,6 +112,53 @@ TEST(Repository, ServerSideClassesDescendFromTheSchemasClasses) {
   EXPECT_EQ(class_named("CIM_Error")->flags & (FLAG_INDICATION | FLAG_CLASS), FLAG_INDICATION);
 }
 
+/// Classes with a flag, and properties, references and methods that a class itself declares with
+/// it.
+struct Flag_Count {
+  std::uint32_t flag;
+  std::size_t classes;
+  std::size_t features;
+};
+
+TEST(Flags, StandOnAsManyClassesAndFeaturesAsTheSchemaSays) {
+  const Flag_Count counts[] = {
+      {FLAG_ABSTRACT, 24, 0},     {FLAG_ASSOCIATION, 140, 0},   {FLAG_AGGREGATION, 36, 0},
+      {FLAG_COMPOSITION, 22, 0},  {FLAG_INDICATION, 1, 0},      {FLAG_EXCEPTION, 1, 0},
+      {FLAG_COUNTER, 0, 51},      {FLAG_GAUGE, 0, 2},           {FLAG_WRITE, 0, 52},
+      {FLAG_EXPERIMENTAL, 0, 46}, {FLAG_REQUIRED, 0, 20},       {FLAG_AGGREGATE, 0, 8},
+      {FLAG_WEAK, 0, 3},          {FLAG_EMBEDDED_OBJECT, 0, 2}, {FLAG_EMBEDDED_INSTANCE, 0, 1},
+  };
+  for (const Flag_Count& expected : counts) {
+    std::size_t classes = 0, features = 0;
+    for (const Meta_Class* meta_class : all_classes()) {
+      classes += (meta_class->flags & expected.flag) != 0;
+      for (std::size_t i = 0; i < meta_class->num_meta_features; ++i) {
+        features += meta_class->locals[i] && (meta_class->meta_features[i]->flags & expected.flag);
+      }
+    }
+    EXPECT_EQ(classes, expected.classes) << std::hex << expected.flag;
+    EXPECT_EQ(features, expected.features) << std::hex << expected.flag;
+  }
+}
+
+TEST(Flags, StandWhereClientsLookForThem) {
+  const auto flags = [](const char* class_name, const char* feature) {
+    return find_feature(class_named(class_name), feature)->flags;
+  };
+  EXPECT_TRUE(flags("TVXHBA_FCPort", "LocationIndicator") & FLAG_WRITE);
+  EXPECT_TRUE(flags("TVXHBA_FCPort", "LocationIndicator") & FLAG_EXPERIMENTAL);
+  EXPECT_TRUE(flags("TVXHBA_ProviderConfigSetting", "current") & FLAG_WRITE);
+  EXPECT_TRUE(flags("TVXHBA_DumpData", "DumpDirectory") & FLAG_WRITE);
+  EXPECT_FALSE(flags("TVXHBA_DumpData", "ElementName") & FLAG_WRITE);
+  EXPECT_TRUE(flags("TVXHBA_FCPortStatistics", "LIPCount") & FLAG_COUNTER);
+  EXPECT_TRUE(flags("TVXHBA_RecordLog", "CurrentNumberOfRecords") & FLAG_GAUGE);
+  EXPECT_TRUE(flags("TVXHBA_SystemDevice", "GroupComponent") & FLAG_AGGREGATE);
+  EXPECT_TRUE(flags("TVXHBA_SystemDevice", "PartComponent") & FLAG_WEAK);
+  EXPECT_TRUE(flags("TVXHBA_RegisteredProfile", "RegisteredName") & FLAG_REQUIRED);
+  EXPECT_TRUE(flags("TVXHBA_DumpService", "ChangeAffectedElementsAssignedSequence") &
+              FLAG_EXPERIMENTAL);
+}
+
 struct Added {
   const char* class_name;
   std::size_t properties;
