@@ -141,8 +141,9 @@ Instance_Handler Delivered::handler() {
 
 bool Delivered::take(Instance* instance, std::int32_t, void* data) {
   auto* self = static_cast<Delivered*>(data);
+  Ref<Instance> owned(instance);
   if (self->probe) self->probe();
-  if (instance) self->m_Instances.push_back(instance);
+  if (instance) self->m_Instances.push_back(owned.release());
   return self->m_Instances.size() < self->limit;
 }
 
@@ -152,7 +153,6 @@ bool isFree(Ranked_Mutex& mutex) {
     Ranked_Lock lock(mutex);
     taken = true;
   });
-  // A lock that is held for good would hang the join: the callers use this where it must be free.
   other.join();
   return taken;
 }

@@ -85,7 +85,7 @@ class Delivered {
   }
   /// After so many instances the handler wants no more.
   std::size_t limit = static_cast<std::size_t>(-1);
-  /// What the handler does before it takes an instance.
+  /// What the handler does before it keeps an instance; what it throws ends the delivery.
   void (*probe)() = nullptr;
 
  private:
@@ -93,7 +93,8 @@ class Delivered {
   std::vector<Instance*> m_Instances;
 };
 
-/// Calls `probe` on another thread and waits for it. Used to see whether a lock is free.
+/// Takes the lock on another thread and gives it back: true. Hangs, and so fails the test, if the
+/// lock is held for good.
 bool isFree(Ranked_Mutex& mutex);
 
 /// A scenario of `cards` cards of one port each, in JSON.

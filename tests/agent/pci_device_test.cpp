@@ -4,6 +4,7 @@
 #include <vector>
 
 #include "Map_Test.h"
+#include "agent/MapSteps.h"
 #include "rmapi/rmapi_pci.h"
 
 namespace cimrt::test {
@@ -220,6 +221,29 @@ TEST_F(PCI_Device, StandsInTheSystemAndConformsToItsProfile) {
     EXPECT_TRUE(conformance.ConformantStandard &&
                 identical(conformance.ManagedElement, agent.m_TVXHBA_PCIDevice_map[i]));
   }
+}
+
+TEST_F(PCI_Device, PortWithoutPCIProfileIsLeftWithoutFurtherClasses) {
+  ProviderAgent& agent = build();
+  Ranked_Lock maps(agent.m_AdapterMapsReadyMutex);
+  Ranked_Lock data(agent.m_DataMutex);
+  agent.m_TVXHBA_RegisteredProfile_map.clear();
+  agent.m_TVXHBA_PCIDevice_map.clear();
+  auto& adapter = dynamic_cast<FCAdapter&>(*agent.m_pData->m_Adapters[0]);
+  auto& port = dynamic_cast<FCPort&>(*adapter.getPort(0));
+  Host_Build host{agent};
+  host.system = agent.m_CIM_ComputerSystem_map[0];
+  Adapter_Build adapterBuild{host, adapter,
+                             dynamic_cast<const FCAdapterAttributes&>(*adapter.getAttributes())};
+  Port_Build portBuild{adapterBuild, port,
+                       dynamic_cast<const FCPortAttributes&>(*port.getAttributes())};
+  EXPECT_EQ(CreatePCIDeviceInstance(portBuild), MAP_BUILD_LEAVE_PORT);
+  EXPECT_EQ(log.level("Failed to create TVXHBA_PCIElementConformsToProfile"), TVX_CRIT);
+  EXPECT_EQ(log.count("CreatePCIDeviceInstance failed"), 0u);
+  // The device is there now: a second one of the same key is a failure of the build.
+  EXPECT_EQ(CreatePCIDeviceInstance(portBuild), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_PCIDevice_map"), TVX_CRIT);
+  EXPECT_EQ(log.count("CreatePCIDeviceInstance failed"), 1u);
 }
 
 }  // namespace
