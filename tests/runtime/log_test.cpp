@@ -1,16 +1,17 @@
 // The trace log. It is set up once in a process, so each test runs its calls in a child.
 #include "runtime/Log.h"
 
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <functional>
-#include <regex>
 #include <sstream>
 #include <string>
 
@@ -120,10 +121,9 @@ TEST_F(Log_Test, AWarningIsDroppedAtLevelErr) {
 TEST_F(Log_Test, ALineHasDateLevelPlaceAndText) {
   write_rc("LOG_LEVEL=DBG\n");
   in_child([] { log(LOG_WARN_, "file.cpp", 12, "number %d", 7); });
-  EXPECT_TRUE(std::regex_match(
-      logged(),
-      std::regex("\\d{4}/\\d{2}/\\d{2} \\d{2}:\\d{2}:\\d{2} WARN: file.cpp\\(12\\): number 7\n")))
-      << logged();
+  EXPECT_THAT(logged(),
+              testing::MatchesRegex("[0-9]{4}/[0-9]{2}/[0-9]{2} [0-9]{2}:[0-9]{2}:[0-9]{2} WARN: "
+                                    "file.cpp\\(12\\): number 7\n"));
 }
 
 TEST_F(Log_Test, ANewlineIsAddedOnlyWhereThereIsNone) {
