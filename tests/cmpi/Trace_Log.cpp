@@ -4,7 +4,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <regex>
+#include <optional>
 #include <stdexcept>
 
 namespace cimrt::test {
@@ -41,16 +41,29 @@ Trace_Log::Trace_Log() {
   _start = absent ? 0 : static_cast<std::size_t>(size);
 }
 
+namespace {
+
+/// Splits "<date> <LEVEL>: <file>(<line>): <text>"; nothing for a line of another form.
+std::optional<Log_Line> parse(const std::string& line) {
+  for (const char* level : {"FATAL", "ERR", "WARN", "INFO", "DBG"}) {
+    const std::size_t start = line.find(std::string(" ") + level + ": ");
+    if (start == std::string::npos) continue;
+    const std::size_t place = line.find("): ", start);
+    if (place == std::string::npos) continue;
+    return Log_Line{level, line.substr(place + 3)};
+  }
+  return std::nullopt;
+}
+
+}  // namespace
+
 std::vector<Log_Line> Trace_Log::lines() const {
-  static const std::regex form(R"(^.* (FATAL|ERR|WARN|INFO|DBG): \S+\(\d+\): (.*)$)");
   std::ifstream file(home.messages());
   file.seekg(static_cast<std::streamoff>(_start));
   std::vector<Log_Line> result;
   std::string line;
-  while (std::getline(file, line)) {
-    std::smatch parts;
-    if (std::regex_match(line, parts, form)) result.push_back({parts[1], parts[2]});
-  }
+  while (std::getline(file, line))
+    if (std::optional<Log_Line> parsed = parse(line)) result.push_back(std::move(*parsed));
   return result;
 }
 
