@@ -39,8 +39,8 @@ struct Init_State {
 };
 
 Init_State& state() {
-  static Init_State* const instance = new Init_State;
-  return *instance;
+  static Init_State instance;
+  return instance;
 }
 
 sem_t* openSemaphore(const std::string& name, unsigned value) {

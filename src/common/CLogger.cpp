@@ -30,10 +30,10 @@ constexpr const char* DUMP_PATH_READ_ONLY = "/var/log/torvex_fc_provider.dmp";
 constexpr std::size_t SETTINGS_LINE = 20;
 constexpr std::size_t PATH_LINE = 256;
 
-/// The innermost lock of the process; never freed, like the logger.
+/// The innermost lock of the process; it goes with the library, like the logger.
 Mutex& logMutex() {
-  static Mutex* const mutex = new Mutex;
-  return *mutex;
+  static Mutex mutex;
+  return mutex;
 }
 
 /// The back end that a disabled logger feeds. Guarded by the log mutex.
@@ -64,8 +64,8 @@ std::string tvxFfdcLogPath() {
 }
 
 CLogger& getLogger() {
-  static CLogger* const logger = new CLogger;
-  return *logger;
+  static CLogger logger;
+  return logger;
 }
 
 void CLogger::log(const char* file, const unsigned* line, int level, const char* format, ...) {

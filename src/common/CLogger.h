@@ -103,7 +103,7 @@ class CLogger {
   std::string m_DumpPath;
 };
 
-/// The singleton: made at first use, never freed.
+/// The singleton: made at first use, gone when the library leaves the process.
 CLogger& getLogger();
 
 /// The first-failure log's path with the TVX_ROOT prefix.
