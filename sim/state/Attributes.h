@@ -22,8 +22,8 @@ enum class Attribute_Kind { Number, Number64, Text, Raw };
 /// One attribute as a scenario names it.
 struct Attribute_Row {
   std::uint32_t id;
-  const char* name;  ///< member name in a scenario
   Attribute_Kind kind;
+  const char* name;  ///< member name in a scenario
 };
 
 /// What a card reports about itself; the numbers of LRM_GetHBAAttributes.

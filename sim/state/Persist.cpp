@@ -227,7 +227,7 @@ std::string save_state(const World& world, const std::string& path) {
   if (file < 0) return system_error("cannot be written");
   const bool written = write_all(file, world_json(world).dump(1) + "\n");
   if (close(file) != 0 || !written || rename(temporary.c_str(), path.c_str()) != 0) {
-    const std::string error = system_error("cannot be written");
+    std::string error = system_error("cannot be written");
     unlink(temporary.c_str());
     return error;
   }

@@ -96,7 +96,7 @@ std::string Simulation::replace_world(const std::string& source, const std::stri
   } catch (const std::exception& error) {
     m_World = World();
     m_World.scenario = source;
-    const std::string message = source + ": " + error.what();
+    std::string message = source + ": " + error.what();
     complain(message);
     return message;
   }
