@@ -2,6 +2,9 @@
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/.." && pwd)
 jobs=${TVX_JOBS:-$(nproc)}
 
+# Compiler results are shared between checkouts, whatever folder they lie in.
+export CCACHE_BASEDIR="$root" CCACHE_NOHASHDIR=1
+
 step() { printf '\n== %s\n' "$*"; }
 
 # configure_and_build PRESET [TARGET...]: quiet when all is well, the whole output when not.
