@@ -152,6 +152,7 @@ TEST_F(Enumeration, ActiveFormUpdatesTheMapBeforeItCopies) {
   EXPECT_TRUE(delivered.at<TVXHBA_FCPort>(0)->ElementName.value == "updated");
 }
 
+#ifndef NDEBUG  // locks are only booked in debug builds
 TEST_F(Enumeration, ActiveFormUpdatesUnderAllItsLocks) {
   ProviderAgent& agent = readyAgent();
   Delivered delivered;
@@ -162,13 +163,10 @@ TEST_F(Enumeration, ActiveFormUpdatesUnderAllItsLocks) {
                  may_take_lock(Lock_Rank::DATA, false) ||
                  may_take_lock(Lock_Rank::CLASS_STATIC, false);
   });
-#ifdef NDEBUG
-  GTEST_SUCCEED() << "locks are only booked in debug builds";
-#else
   EXPECT_FALSE(mayTakeAny);
-#endif
   EXPECT_EQ(delivered.size(), 4u);
 }
+#endif
 
 TEST_F(Enumeration, ExceptionOfTheUpdateDeliversNothingAndFreesTheLocks) {
   ProviderAgent& agent = readyAgent();

@@ -27,16 +27,17 @@ void look_at(const void* block) noexcept {
 
 }  // namespace
 
-// Replaced so that a test sees a block as it is released.
-void* operator new(std::size_t n) {
+// Replaced so that a test sees a block as it is released. Never inlined: a compiler that sees
+// malloc and free on one side only takes the pair for mismatched.
+[[gnu::noinline]] void* operator new(std::size_t n) {
   if (void* block = std::malloc(n)) return block;
   throw std::bad_alloc();
 }
-void operator delete(void* block) noexcept {
+[[gnu::noinline]] void operator delete(void* block) noexcept {
   look_at(block);
   std::free(block);
 }
-void operator delete(void* block, std::size_t) noexcept {
+[[gnu::noinline]] void operator delete(void* block, std::size_t) noexcept {
   look_at(block);
   std::free(block);
 }
