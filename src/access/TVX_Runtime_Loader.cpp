@@ -3,6 +3,7 @@
 #include <dlfcn.h>
 
 #include <array>
+#include <cstdio>
 #include <string>
 
 #include "common/CLogger.h"

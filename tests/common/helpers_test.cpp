@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 
 #include <filesystem>
+#include <stdexcept>
 #include <string>
 
 #include "common/CLogger.h"
@@ -138,6 +139,29 @@ TEST(Parse_Version, RefusesNull) {
   EXPECT_EQ(parseVersion(nullptr, version), FAILED);
   EXPECT_THAT(capture.lines(),
               ElementsAre(Logged{5, "parseVersion Error: Input FirmwareVersion is Null"}));
+}
+
+/// Back end that fails at one message.
+class Failing_Back_End : public cimrt::TVX_LoggerInterface {
+ public:
+  void log(int, const char*, const unsigned*, const char* text) override {
+    if (std::string(text) == "Filled ReleaseType") throw std::runtime_error("back end");
+  }
+  void open() override {}
+  void close() override {}
+  void clear() override {}
+};
+
+TEST(Parse_Version, CatchesWhatIsThrownOnTheWay) {
+  const Log_Capture capture;
+  Failing_Back_End failing;
+  cimrt::getLogger().registerInterface(&failing);
+  ParsedVersion version;
+  const int status = parseVersion("2.01a4", version);
+  cimrt::getLogger().unregisterInterface(&failing);
+  EXPECT_EQ(status, FAILED);
+  EXPECT_TRUE(capture.has(5, "parseVersion: error occurred while parsing..."));
+  EXPECT_FALSE(capture.has(5, "parseVersion: Version parsing success"));
 }
 
 TEST(Version_Numbers, AreCutAtDotsAndHyphens) {

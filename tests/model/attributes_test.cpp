@@ -273,6 +273,7 @@ TEST_F(Discovery, StalePortDataAreReadOnceMore) {
   // The first reading of port 0 belongs to the adapter, the second to the port.
   host.add("Torvex-A0", 1).ports[0].statuses = {8, 0, 8, 0};
   build();
+  EXPECT_TRUE(capture.has(TVX_DBG, "FCPort::FCPort"));
   EXPECT_EQ(data.m_Ports.size(), 1U);
   EXPECT_EQ(host.refreshed, 2);
 }
