@@ -47,6 +47,17 @@ TEST_F(Discovery, FindsAdaptersAndPorts) {
   EXPECT_EQ(capture.position("freeAllData: Entry"), 1U);
 }
 
+TEST_F(Discovery, AHealthyHostIsTracedAtTheLowestLevelOnly) {
+  host.add("Torvex-A0", 1);
+  {
+    Data own;
+    own.buildAdapterData();
+  }
+  for (const auto& line : capture.lines()) EXPECT_EQ(line.level, TVX_DBG) << line.text;
+  EXPECT_TRUE(capture.has(TVX_DBG, "~Port"));
+  EXPECT_TRUE(capture.has(TVX_DBG, "Data Pointer deleted."));
+}
+
 TEST_F(Discovery, NoAdapterIsCritical) {
   build();
   EXPECT_TRUE(capture.has(TVX_DBG, "Number of Adapters detected = 0"));
