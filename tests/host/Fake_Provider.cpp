@@ -15,6 +15,7 @@ constexpr unsigned widgetCount = 3;
 const CMPIBroker* broker = nullptr;
 bool refuseUnload = false;
 CMPIString* lateString = nullptr;
+void* keptBlock = nullptr;
 
 CMPIStatus ok() {
   return CMPIStatus{CMPI_RC_OK, nullptr};
@@ -316,7 +317,9 @@ unsigned misbehave(const std::string& how, const CMPIContext* context) {
     CMPIString* clone = CMClone(string, nullptr);
     CMRelease(clone);
   } else if (how == "leak-memory") {
-    return broker->mft->cmpiMalloc(broker, 1) == nullptr ? 1 : 0;
+    keptBlock = broker->mft->cmpiMalloc(broker, 1);
+  } else if (how == "free-kept-memory") {
+    broker->mft->cmpiFree(broker, keptBlock);
   } else if (how == "free-memory") {
     broker->mft->cmpiFree(broker, broker->mft->cmpiMalloc(broker, 1));
   } else if (how == "keep") {

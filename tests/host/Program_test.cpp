@@ -4,7 +4,6 @@
 
 #include <fstream>
 #include <nlohmann/json.hpp>
-#include <regex>
 
 #include "Run_Program.h"
 #include "cli/ExitCode.h"
@@ -24,9 +23,15 @@ nlohmann::json jsonOf(const Outcome& result) {
   return nlohmann::json::parse(result.out);
 }
 
-/// A text as the manual page writes it.
+/// A text as the manual page writes it: each '-' behind a backslash, if it belongs to an option.
 std::string manText(const std::string& text) {
-  return std::regex_replace(text, std::regex("--"), "\\-\\-");
+  std::string result;
+  bool inOption = false;
+  for (std::size_t i = 0; i < text.size(); ++i) {
+    inOption = text.compare(i, 2, "--") == 0 || (inOption && text[i] != ' ');
+    result += (inOption && text[i] == '-' ? "\\" : "") + std::string(1, text[i]);
+  }
+  return result;
 }
 
 constexpr const char* first = R"('FAKE_Widget.Name="widget0",Number=0')";
@@ -292,11 +297,15 @@ TEST(ProgramTest, TheManualPageListsExitCodesAndOptions) {
         << each.text;
   }
   const std::string help = run("--help", false).out;
-  const std::regex option("\n  (--[a-z-]+)");
-  for (std::sregex_iterator i(help.begin(), help.end(), option), end; i != end; ++i) {
-    std::string escaped = std::regex_replace((*i)[1].str(), std::regex("-"), "\\-");
-    EXPECT_NE(page.find(escaped), std::string::npos) << (*i)[1];
+  std::size_t options = 0;
+  for (std::size_t i = help.find("\n  --"); i != std::string::npos;
+       i = help.find("\n  --", i + 1)) {
+    const std::size_t start = i + 3;
+    const std::string option = help.substr(start, help.find_first_of(" \n", start) - start);
+    EXPECT_NE(page.find(manText(option)), std::string::npos) << option;
+    ++options;
   }
+  EXPECT_GE(options, 10U);
 }
 
 TEST(ProgramTest, BrokerVersionsAreSelectable) {

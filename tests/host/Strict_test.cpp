@@ -63,6 +63,7 @@ TEST(StrictTest, MemoryThatStaysIsALeak) {
   EXPECT_EQ(leaked.report.leakedBlocks, 1U);
   EXPECT_TRUE(leaked.report.leaks());
   EXPECT_NE(leaked.report.text().find("1 memory blocks leaked"), std::string::npos);
+  EXPECT_FALSE(broker.misbehave("free-kept-memory").report.leaks());
   EXPECT_FALSE(broker.misbehave("free-memory").report.leaks());
 }
 
