@@ -1,7 +1,9 @@
 /* The present management library, with three of its functions. */
 #include "rmapi/rmapi.h"
 
-RM_STATUS LRM_InitLib(void) { return 0; }
+RM_STATUS LRM_InitLib(void) {
+  return 0;
+}
 RM_STATUS LRM_GetDriverType(HBA_WWN wwpn, uint32_t* type) {
   *type = wwpn.wwn[7];
   return 0;
