@@ -168,6 +168,27 @@ TEST_F(Log_Test, TheLockFileIsForItsOwnerAlone) {
   EXPECT_EQ(st.st_mode & 0777u, 0600u);
 }
 
+TEST_F(Log_Test, TheDirectoryIsOpenToEveryoneWhomTheMaskAllows) {
+  write_rc("LOG_LEVEL=DBG\n");
+  in_child([] {
+    umask(0);
+    log(LOG_FATAL_, "file.cpp", 1, "text");
+  });
+  struct stat st = {};
+  ASSERT_EQ(stat((home() / ".cimrt").c_str(), &st), 0);
+  EXPECT_EQ(st.st_mode & 0777u, 0777u);
+}
+
+TEST_F(Log_Test, SpaceAroundTheEqualsSignAndBehindTheLevelIsSkipped) {
+  write_rc("LOG_LEVEL \t=\t  WARN \t\r\n");
+  EXPECT_EQ(lines_in(log_every_level()), 3u);
+}
+
+TEST_F(Log_Test, ALevelBehindALongCommentIsRead) {
+  write_rc("#" + std::string(1000, 'x') + "\nLOG_LEVEL=ERR\n");
+  EXPECT_EQ(lines_in(log_every_level()), 2u);
+}
+
 TEST_F(Log_Test, AnExistingDirectoryAndLogAreContinued) {
   write_rc("LOG_LEVEL=FATAL\n");
   log_every_level();
