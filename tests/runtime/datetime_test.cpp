@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cstdlib>
+#include <cstring>
 #include <ctime>
 #include <random>
 #include <string>
@@ -108,6 +109,21 @@ INSTANTIATE_TEST_SUITE_P(
                     Refused_Text{"LetterInOffset", "20010203040506.000007+09x"},
                     Refused_Text{"SignInOffset", "20010203040506.000007+-90"}),
     [](const auto& param) { return param.param.name; });
+
+/// True if both hold the same rep: a datetime is one pointer to it.
+bool share_a_rep(const Datetime& a, const Datetime& b) {
+  static_assert(sizeof(Datetime) == sizeof(void*));
+  return std::memcmp(static_cast<const void*>(&a), static_cast<const void*>(&b), sizeof a) == 0;
+}
+
+TEST(Datetime, CopiesShareTheRepUntilATextIsSetEvenOneThatIsRefused) {
+  Datetime datetime(42, 7);
+  const Datetime sharer(datetime);
+  EXPECT_TRUE(share_a_rep(datetime, sharer));
+  EXPECT_FALSE(datetime.set("no datetime"));
+  EXPECT_FALSE(share_a_rep(datetime, sharer));
+  EXPECT_TRUE(datetime.equal(sharer));
+}
 
 TEST(Datetime, DoesNotCheckTheRangeOfFields) {
   Datetime datetime;
