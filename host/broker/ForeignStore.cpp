@@ -40,7 +40,7 @@ Status failure(int rc, std::string message) {
 }
 
 Json parsed(const std::string& text) {
-  const Json json = Json::parse(text);
+  Json json = Json::parse(text);
   if (!json.is_object() || json.value("version", 0) != storeVersion) {
     throw std::runtime_error(fmt::format("the store needs \"version\": {}", storeVersion));
   }

@@ -165,7 +165,7 @@ Status ProviderLibrary::cleanup(const std::string& className, InterfaceKind kind
   if (found == m_Known.end()) {
     return {CMPI_RC_ERR_NOT_FOUND, className + " has no such interface in use"};
   }
-  const Status result = cleanupOne(found->second, terminating);
+  Status result = cleanupOne(found->second, terminating);
   if (result.ok()) {
     m_Known.erase(found);
   }
@@ -176,7 +176,7 @@ Status ProviderLibrary::cleanupAll(bool terminating) {
   const std::lock_guard lock(m_Mutex);
   Status first;
   std::erase_if(m_Known, [&](const auto& entry) {
-    const Status result = cleanupOne(entry.second, terminating);
+    Status result = cleanupOne(entry.second, terminating);
     if (first.ok()) {
       first = result;
     }

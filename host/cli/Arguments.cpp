@@ -113,7 +113,7 @@ class ValueReader {
   Value inRange(const std::string& text, std::uint64_t magnitude, bool negative) const {
     const CMPIType type = m_Feature.cmpiType;
     if (type < CMPI_SINT) {
-      const Value value = Value::number(type, magnitude);
+      Value value = Value::number(type, magnitude);
       if (negative || value.asUnsigned() != magnitude) {
         fail(text);
       }
@@ -124,7 +124,7 @@ class ValueReader {
       fail(text);
     }
     const auto wide = static_cast<std::int64_t>(negative ? 0 - magnitude : magnitude);
-    const Value value = Value::signedNumber(type, wide);
+    Value value = Value::signedNumber(type, wide);
     if (value.asSigned() != wide) {
       fail(text);
     }

@@ -160,6 +160,7 @@ std::string wwnText(const std::string& text) {
 std::vector<PortRow> portRows(const std::vector<Instance>& ports,
                               const std::vector<Instance>& cards) {
   std::vector<PortRow> rows;
+  rows.reserve(ports.size());
   for (const Instance& port : ports) {
     rows.push_back(rowOf(port, cards));
   }

@@ -110,7 +110,8 @@ bool _indication_proc(Instance* instance, std::int32_t /*status*/, void* client_
   if (!instance) return false;
   const Ref<Instance> owned(instance);
   auto* thread_context = static_cast<CMPI_Thread_Context*>(Thread_Context::top());
-  CIMRT_ASSERT(thread_context != 0);
+  CIMRT_ASSERT(thread_context !=
+               0);  // NOLINT(modernize-use-nullptr): the text is known to operators
 
   auto& adapter = *static_cast<CMPI_Adapter*>(client_data);
   const Auto_Mutex locked(adapter.lock);

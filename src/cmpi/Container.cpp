@@ -57,6 +57,7 @@ int Container::convert(const Meta_Record* meta_class, std::uint32_t flags, Insta
   Ref<Instance> made;
   if (!instance) made.reset(create_record(meta_class));
   Instance* record = made ? made.get() : instance;
+  if (!record) return -1;
   nullify(record);
 
   const std::uint32_t size = get_size();

@@ -102,6 +102,7 @@ constinit const Array_Traits* const array_traits[NUM_TYPES] = {
     &object<String>,      &object<Datetime>,
 };
 
+// NOLINTNEXTLINE(bugprone-sizeof-expression): the elements are the bare pointers
 constinit const Array_Traits instance_array_traits = {sizeof(Instance*), nullptr, nullptr, nullptr};
 
 Array_Base::Array_Base(const Array_Traits* traits) : _rep(allocate(traits, FIRST_CAPACITY)) {}

@@ -165,6 +165,7 @@ void Buffer::vformat(const char* fmt, va_list args) {
 
 const char* Buffer::c_str() {
   if (!_data) reserve(MIN_CAPACITY);
+  // NOLINTNEXTLINE(clang-analyzer-core.NullDereference): reserve made the block
   _data[_size] = '\0';
   return _data;
 }

@@ -21,16 +21,16 @@ constexpr std::size_t MAX_HEX_DIGITS = 16;
 constexpr std::array<std::int8_t, 256> digit_values = [] {
   std::array<std::int8_t, 256> values{};
   values.fill(-1);
-  for (int i = 0; i < 10; ++i)
-    values[static_cast<std::size_t>('0' + i)] = static_cast<std::int8_t>(i);
-  for (int i = 0; i < 6; ++i)
-    values[static_cast<std::size_t>('A' + i)] = static_cast<std::int8_t>(10 + i);
+  for (std::size_t i = 0; i < 10; ++i) values[std::size_t{'0'} + i] = static_cast<std::int8_t>(i);
+  for (std::size_t i = 0; i < 6; ++i)
+    values[std::size_t{'A'} + i] = static_cast<std::int8_t>(10 + i);
   return values;
 }();
 
 /// Value of a digit of `base`, or -1.
 int digit(char c, int base = 10) {
-  const int value = digit_values[static_cast<unsigned char>(c)];
+  const int value{digit_values[static_cast<unsigned char>(
+      c)]};  // NOLINT(bugprone-signed-char-misuse): -1 is meant
   return value < base ? value : -1;
 }
 

@@ -88,6 +88,7 @@ Datetime::~Datetime() {
   release(_rep);
 }
 
+// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): taking before dropping is safe on itself too
 Datetime& Datetime::operator=(const Datetime& other) noexcept {
   DatetimeRep* old = _rep;
   other._rep->refs.fetch_add(1, std::memory_order_relaxed);

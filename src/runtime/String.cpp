@@ -98,6 +98,7 @@ String::String(const char* a, const char* b, const char* c) : String(a, b) {
 String::String(const String& other, std::size_t pos, std::size_t n)
     : _rep(make_rep(other.slice(pos, n))) {}
 
+// NOLINTNEXTLINE(bugprone-unhandled-self-assignment): taking before dropping is safe on itself too
 String& String::operator=(const String& other) noexcept {
   StringRep* rep = other._rep;
   retain(rep);

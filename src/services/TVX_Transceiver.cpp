@@ -246,7 +246,8 @@ TVX_Block readSff(const HBA_WWN& wwpn) {
 
 float lowTemperature(std::uint16_t word) {
   if ((word & 0x8000U) == 0) return temperature(word);
-  return -static_cast<float>(((word ^ 32767) + 1) / 2560);
+  const int whole = ((word ^ 32767) + 1) / 2560;  // in whole numbers, as the module's word is read
+  return -static_cast<float>(whole);
 }
 
 std::string manufactureDateText(const std::string& dateCode) {
