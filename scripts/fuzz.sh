@@ -6,7 +6,7 @@ set -euo pipefail
 . "$(dirname "$0")/lib.sh"
 
 seconds=${1:-10}
-configure_and_build fuzz
+configure_and_build fuzz tvx_fuzz_targets
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
 count=0
