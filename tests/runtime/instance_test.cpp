@@ -3,6 +3,7 @@
 #include <gtest/gtest.h>
 
 #include <cmath>
+#include <cstdlib>
 #include <string>
 #include <vector>
 
@@ -142,10 +143,15 @@ TEST(Instance, DestroyReleasesWhatItOwns) {
 }
 
 TEST(Instance, UnrefOfNullDoesNothing) {
-  unref(static_cast<Instance*>(nullptr));
-  ref(static_cast<Instance*>(nullptr));
-  destroy(static_cast<Instance*>(nullptr));
-  SUCCEED();
+  Instance* const nothing = nullptr;
+  EXPECT_EXIT(
+      {
+        unref(nothing);
+        ref(nothing);
+        destroy(nothing);
+        std::_Exit(7);  // reached only if none of them touched the null pointer
+      },
+      testing::ExitedWithCode(7), "");
 }
 
 TEST(Instance, RefCountsCopies) {
