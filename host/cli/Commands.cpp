@@ -11,7 +11,7 @@
 #include "cli/Describe.h"
 #include "cli/Output.h"
 #include "cli/Places.h"
-#include "cli/Ports.h"
+#include "cli/Requests.h"
 #include "cli/Session.h"
 #include "cli/Table.h"
 
@@ -25,12 +25,6 @@ PathResolver resolverOf(Session& session) {
 }
 
 // ---- Printing ----
-
-void printJson(Session& session, const char* member, Json content) {
-  Json json = jsonHead(session.options().command);
-  json[member] = std::move(content);
-  session.out() << json.dump(2) << "\n";
-}
 
 void printPaths(Session& session, const std::vector<ObjectPath>& paths) {
   if (session.options().format != Format::Json) {
@@ -291,34 +285,6 @@ ExitCode remove(Session& session) {
   return ExitCode::Ok;
 }
 
-Json portJson(const PortRow& row) {
-  return {
-      {"wwpn", row.wwpn},           {"model", row.model},   {"adapter", row.adapter},
-      {"serialNumber", row.serial}, {"speed", row.speed},   {"speedText", speedWords(row.speed)},
-      {"maxSpeed", row.maxSpeed},   {"state", row.state},   {"type", row.type},
-      {"fcId", row.fcId},           {"fabric", row.fabric}, {"firmware", row.firmware}};
-}
-
-ExitCode ports(Session& session) {
-  Request request;
-  request.operation = Operation::EnumerateInstances;
-  request.path.className = "TVXHBA_FCPort";
-  const Reply fcPorts = session.run(request);
-  request.path.className = "TVXHBA_Card";
-  const Reply cards = session.run(request);
-  const auto rows = portRows(fcPorts.instances, cards.instances);
-  if (session.options().format != Format::Json) {
-    session.out() << portTable(rows);
-    return ExitCode::Ok;
-  }
-  Json list = Json::array();
-  for (const PortRow& row : rows) {
-    list.push_back(portJson(row));
-  }
-  printJson(session, "ports", std::move(list));
-  return ExitCode::Ok;
-}
-
 struct CommandRow {
   const char* name;
   ExitCode (*run)(Session&);
@@ -327,29 +293,34 @@ struct CommandRow {
 constexpr CommandRow commands[] = {{"ein", enumerate}, {"ei", enumerate},  {"gi", get},
                                    {"ai", walk},       {"ain", walk},      {"ri", walk},
                                    {"rin", walk},      {"cm", callMethod}, {"ci", create},
-                                   {"mi", modify},     {"di", remove},     {"ports", ports}};
+                                   {"mi", modify},     {"di", remove}};
+
+/// What the command line chose: a family's command, or one of the table.
+CommandRun chosen(const Options& options) {
+  if (options.run) {
+    return options.run;
+  }
+  for (const CommandRow& command : commands) {
+    if (options.command == command.name) {
+      return command.run;
+    }
+  }
+  throw CommandError(ExitCode::Usage, "unknown command '" + options.command + "'");
+}
 
 /// Strict mode's findings are told after a failure too.
-ExitCode runInSession(const CommandRow& command, Session& session) {
+ExitCode runWithLibrary(const Options& options, const ClassCatalogue& classes, std::ostream& out,
+                        std::ostream& err) {
+  const CommandRun run = chosen(options);
+  Session session(options, classes, out, err);
   try {
-    const ExitCode code = command.run(session);
+    const ExitCode code = run(session);
     const ExitCode strict = session.finish();
     return code == ExitCode::Ok ? strict : code;
   } catch (const CommandError&) {
     session.finish();
     throw;
   }
-}
-
-ExitCode runWithLibrary(const Options& options, const ClassCatalogue& classes, std::ostream& out,
-                        std::ostream& err) {
-  for (const CommandRow& command : commands) {
-    if (options.command == command.name) {
-      Session session(options, classes, out, err);
-      return runInSession(command, session);
-    }
-  }
-  throw CommandError(ExitCode::Usage, "unknown command '" + options.command + "'");
 }
 
 void reportError(const Options& options, const CommandError& error, std::ostream& out,

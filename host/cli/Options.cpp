@@ -146,7 +146,7 @@ std::optional<Options> parseOptions(int argc, const char* const* argv, int& exit
   addGlobals(app, options, raw);
   addClassCommands(app, options);
   addPathCommands(app, options);
-  addCommand(app, options, "ports", "table of the FC ports");
+  addFamilies(app, options);
   app.require_subcommand(1);
   app.footer(footer());
   try {

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "Broker.h"
+#include "cli/CommandFamily.h"
 
 namespace tvx::host {
 
@@ -28,6 +29,7 @@ struct Options {
 
   // The command and its words.
   std::string command;
+  CommandRun run;  ///< set for the commands of a family
   std::string className;
   std::string path;
   std::string method;

@@ -1,33 +1,14 @@
 // tvxcim --sim as a person runs it: the built program, the built provider, simulated adapters.
-#include <filesystem>
 #include <nlohmann/json.hpp>
 
-#include "Run_Program.h"
+#include "Simulated_Program.h"
 
 namespace tvx::host {
 namespace {
 
 namespace fs = std::filesystem;
 
-class SimulationTest : public ::testing::Test {
- protected:
-  SimulationTest() {
-    std::string pattern = testing::TempDir() + "tvxcim-sim-XXXXXX";
-    m_Temporary = mkdtemp(pattern.data());
-  }
-  ~SimulationTest() override { fs::remove_all(m_Temporary); }
-
-  test::Outcome run(const std::string& words, const std::string& environment = "") {
-    return test::runShell("env -u TVX_ROOT -u TVX_SIM_STATE -u TVX_SIM_SCENARIO TMPDIR=" +
-                          m_Temporary.string() + " " + environment + " " TVXCIM " " + words);
-  }
-
-  static std::size_t lines(const std::string& text) {
-    return static_cast<std::size_t>(std::count(text.begin(), text.end(), '\n'));
-  }
-
-  fs::path m_Temporary;
-};
+using SimulationTest = test::Simulated_Program;
 
 TEST_F(SimulationTest, PortsShowsTheFourPortsOfTheDefaultHost) {
   const test::Outcome result = run("--sim ports");

@@ -1,0 +1,10 @@
+// One function for each family of commands.
+#pragma once
+
+#include "cli/CommandFamily.h"
+
+namespace tvx::host {
+
+void addPortCommands(CLI::App& app, const CommandChooser& choose);
+
+}  // namespace tvx::host
