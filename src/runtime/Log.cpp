@@ -88,6 +88,13 @@ const char* level_text(char* line) {
   return *p == '=' ? skip_space(p + 1) : nullptr;
 }
 
+/// Drops what is left of a line that was longer than its place: it is no line of its own.
+void skip_rest_of_line(const char* line, std::FILE* file) {
+  if (std::strchr(line, '\n')) return;
+  for (int c = std::fgetc(file); c != '\n' && c != EOF; c = std::fgetc(file)) {
+  }
+}
+
 /// The level that the rc file sets in its first line of that kind; none if there is no such line or
 /// no such level.
 std::optional<int> read_level(const Path& rc) {
@@ -95,6 +102,7 @@ std::optional<int> read_level(const Path& rc) {
   if (!file) return std::nullopt;
   char line[LINE_SIZE];
   while (std::fgets(line, sizeof line, file.get())) {
+    skip_rest_of_line(line, file.get());
     const char* text = level_text(line);
     if (!text) continue;
     int level = 0;

@@ -14,6 +14,14 @@
 namespace cimrt {
 namespace {
 
+/// While set, the system's clock fails.
+bool clock_fails = false;
+
+extern "C" int __real_gettimeofday(struct timeval* time, void* zone);
+extern "C" int __wrap_gettimeofday(struct timeval* time, void* zone) {
+  return clock_fails ? -1 : __real_gettimeofday(time, zone);
+}
+
 constexpr const char* INTERVAL = "00000001020304.000005:000";
 constexpr std::uint64_t INTERVAL_USEC = 93784000005u;  // 1 day, 2 h, 3 min, 4 s, 5 us
 
@@ -205,6 +213,15 @@ TEST(Datetime, NowIsATimestampOfTheCurrentTime) {
   EXPECT_TRUE(now.is_timestamp());
   EXPECT_GE(now.usec(), before);
   EXPECT_LE(now.usec(), after);
+}
+
+TEST(Datetime, NowIsAZeroIntervalWhenTheClockFails) {
+  clock_fails = true;
+  const Datetime now = Datetime::now();
+  clock_fails = false;
+  EXPECT_TRUE(now.is_interval());
+  EXPECT_EQ(now.usec(), 0U);
+  EXPECT_EQ(now.utc(), 0);
 }
 
 TEST(Datetime, PrintsItsText) {

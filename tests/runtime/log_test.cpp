@@ -8,12 +8,17 @@
 #include <unistd.h>
 
 #include <algorithm>
+#include <atomic>
+#include <chrono>
+#include <csignal>
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <functional>
 #include <sstream>
 #include <string>
+#include <thread>
+#include <utility>
 
 #include "Test_Schema.h"
 #include "runtime/File_Lock.h"
@@ -189,6 +194,23 @@ TEST_F(Log_Test, ALevelBehindALongCommentIsRead) {
   EXPECT_EQ(lines_in(log_every_level()), 2u);
 }
 
+TEST_F(Log_Test, TheRestOfALineBeyond1023CharactersIsNoLine) {
+  const std::string comment = "#" + std::string(1022, 'x');
+  ASSERT_EQ(comment.size(), 1023U);
+  write_rc(comment + "LOG_LEVEL = dbg\nLOG_LEVEL = warn\n");
+  EXPECT_EQ(lines_in(log_every_level()), 3U) << "fatal, err and warn";
+}
+
+TEST_F(Log_Test, ALevelBefore2000BlanksIsRead) {
+  write_rc("LOG_LEVEL = info" + std::string(2000, ' ') + "\n");
+  EXPECT_EQ(lines_in(log_every_level()), 4U);
+}
+
+TEST_F(Log_Test, ALineOf1023CharactersWithoutAnEndIsTheLast) {
+  write_rc("#" + std::string(1022, 'x'));
+  EXPECT_EQ(log_every_level(), "");
+}
+
 TEST_F(Log_Test, AnExistingDirectoryAndLogAreContinued) {
   write_rc("LOG_LEVEL=FATAL\n");
   log_every_level();
@@ -278,6 +300,106 @@ TEST(LogLevel, IsFoundByNameInAnyCase) {
   EXPECT_EQ(string_to_log_level("", level), -1);
   EXPECT_EQ(string_to_log_level("DEBUG", level), -1);
   EXPECT_EQ(level, 77);
+}
+
+/// How a thread of this process stands in the system: state letter and voluntary switches so far.
+struct Thread_State {
+  char letter = '?';
+  unsigned long switches = 0;
+};
+
+Thread_State state_of(pid_t thread) {
+  std::ifstream status("/proc/self/task/" + std::to_string(thread) + "/status");
+  Thread_State state;
+  std::string word;
+  while (status >> word) {
+    if (word == "State:") status >> state.letter;
+    if (word == "voluntary_ctxt_switches:") status >> state.switches;
+  }
+  return state;
+}
+
+/// Waits until the thread sleeps again after `before` switches; false after ten seconds.
+bool sleeps_after(pid_t thread, unsigned long before) {
+  const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(10);
+  while (std::chrono::steady_clock::now() < end) {
+    const Thread_State state = state_of(thread);
+    if (state.letter == 'S' && state.switches > before) return true;
+    std::this_thread::yield();
+  }
+  return false;
+}
+
+/// A child process that holds the lock of a file until told to end.
+class Lock_Holder {
+ public:
+  explicit Lock_Holder(const char* path) {
+    int ready[2];
+    if (pipe(ready) != 0 || pipe(_end) != 0) std::abort();
+    _child = fork();
+    if (_child == 0) {
+      File_Lock lock(path);
+      lock.lock();
+      char byte = 'r';
+      const bool told = write(ready[1], &byte, 1) == 1 && read(_end[0], &byte, 1) == 1;
+      _exit(told ? 0 : 1);  // which frees the lock
+    }
+    char byte = 0;
+    _held = read(ready[0], &byte, 1) == 1;
+    for (const int fd : {ready[0], ready[1], _end[0]}) close(fd);
+  }
+  ~Lock_Holder() { release(); }
+  Lock_Holder(const Lock_Holder&) = delete;
+  Lock_Holder& operator=(const Lock_Holder&) = delete;
+
+  bool held() const { return _held; }
+  void release() {
+    if (_child <= 0) return;
+    EXPECT_EQ(write(_end[1], "e", 1), 1);
+    close(_end[1]);
+    EXPECT_EQ(waitpid(std::exchange(_child, 0), nullptr, 0) > 0, true);
+  }
+
+ private:
+  pid_t _child = 0;
+  int _end[2] = {-1, -1};
+  bool _held = false;
+};
+
+TEST(FileLock, SignalsDoNotEndTheWait) {
+  char path[] = "/tmp/runtime_lock_test.XXXXXX";
+  close(mkstemp(path));
+  Lock_Holder holder(path);
+  ASSERT_TRUE(holder.held());
+  struct sigaction interrupting = {};
+  interrupting.sa_handler = [](int) {};  // without SA_RESTART the wait fails with EINTR
+  struct sigaction before = {};
+  sigaction(SIGUSR1, &interrupting, &before);
+
+  std::atomic<pid_t> id{0};
+  std::atomic<bool> locked{false};
+  std::thread waiter([&] {
+    File_Lock lock(path);
+    id = gettid();
+    lock.lock();
+    locked = true;
+    lock.unlock();
+  });
+  while (id == 0) std::this_thread::yield();
+  unsigned long switches = 0;
+  for (int round = 0; round < 3 && !locked; ++round) {
+    ASSERT_TRUE(sleeps_after(id, switches)) << "round " << round;
+    EXPECT_FALSE(locked) << "the other process still holds the lock";
+    switches = state_of(id).switches;
+    pthread_kill(waiter.native_handle(), SIGUSR1);
+  }
+  EXPECT_TRUE(sleeps_after(id, switches)) << "it waits again behind the last signal";
+  EXPECT_FALSE(locked);
+  holder.release();
+  waiter.join();
+  EXPECT_TRUE(locked);
+  sigaction(SIGUSR1, &before, nullptr);
+  fs::remove(path);
 }
 
 TEST(FileLock, OfAFileThatCannotBeOpenedDoesNothing) {

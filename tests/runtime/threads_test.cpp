@@ -89,6 +89,21 @@ TEST(Mutex, TryLockAnswers16WhenAnotherThreadHoldsIt) {
   mutex.unlock();
 }
 
+TEST(Mutex, TryLockAnswersMinusOneOnAnyOtherFailure) {
+  Mutex mutex(false);
+  // A robust mutex whose holder ended answers EOWNERDEAD, which is neither success nor EBUSY.
+  pthread_mutexattr_t robust;
+  pthread_mutexattr_init(&robust);
+  pthread_mutexattr_setrobust(&robust, PTHREAD_MUTEX_ROBUST);
+  pthread_mutex_destroy(mutex.native());
+  ASSERT_EQ(pthread_mutex_init(mutex.native(), &robust), 0);
+  pthread_mutexattr_destroy(&robust);
+  std::thread([&] { mutex.lock(); }).join();
+  EXPECT_EQ(mutex.try_lock(), -1);
+  pthread_mutex_consistent(mutex.native());
+  mutex.unlock();
+}
+
 TEST(Mutex, ARecursiveOneIsLockedAgainByItsHolder) {
   Mutex mutex(true);
   mutex.lock();
