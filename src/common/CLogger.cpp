@@ -15,6 +15,7 @@
 #include "common/TVX_File.h"
 #include "common/TVX_Path.h"
 #include "runtime/Buffer.h"
+#include "runtime/Safe_Open.h"
 
 namespace cimrt {
 
@@ -236,7 +237,8 @@ void CLogger::loadConfig() {
 }
 
 void CLogger::writeDump() {
-  const TVX_File stream = tvxOpenFile(tvxPath(dumpPath().c_str()).c_str(), "w");
+  const TVX_File stream(
+      open_for_writing(tvxPath(dumpPath().c_str()).c_str(), "w", LOG_PERMISSIONS));
   if (stream == nullptr) {
     TVX_LOG(TVX_ERR, "Unable to open dump file\n");
     return;

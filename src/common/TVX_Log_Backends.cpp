@@ -10,6 +10,7 @@
 
 #include "common/CLogger.h"
 #include "common/TVX_Clock.h"
+#include "runtime/Safe_Open.h"
 
 namespace cimrt {
 
@@ -39,7 +40,7 @@ bool canBeLogFile(const char* path) {
 }
 
 std::FILE* openAppending(const char* path) {
-  return std::fopen(path, "a+e");
+  return open_for_writing(path, "a+", LOG_PERMISSIONS);
 }
 
 }  // namespace
@@ -91,7 +92,8 @@ void TVX_FileLogger::clear() {
   const Auto_Mutex lock(m_Mutex);
   if (m_File == nullptr) return;
   closeStream();
-  if (std::FILE* emptied = std::fopen(m_Path.c_str(), "we")) std::fclose(emptied);
+  if (std::FILE* emptied = open_for_writing(m_Path.c_str(), "w", LOG_PERMISSIONS))
+    std::fclose(emptied);
   m_File = openAppending(m_Path.c_str());
 }
 

@@ -15,6 +15,7 @@
 #include "runtime/Conversions.h"
 #include "runtime/Datetime.h"
 #include "runtime/File_Lock.h"
+#include "runtime/Safe_Open.h"
 #include "runtime/Types.h"
 
 namespace cimrt {
@@ -121,7 +122,7 @@ void open_log(const char* home) {
   mkdir(directory.c_str(), DIRECTORY_MODE);
   auto locked = std::make_unique<File_Lock>(lock.c_str());
   if (!locked->usable()) return;
-  log_file = std::fopen(messages.c_str(), "ae");
+  log_file = open_for_writing(messages.c_str(), "a", LOG_PERMISSIONS);
   if (log_file) file_lock = locked.release();
 }
 
