@@ -28,6 +28,7 @@ typedef int RM_STATUS;
 enum {
   RM_OK = 0,
   RM_ERROR = 1,                   /* generic failure; also what a missing entry point gives */
+  RM_ERROR_NOT_SUPPORTED = 2,     /* the host or the adapter can't do it */
   RM_ERROR_INVALID_POINTER = 4,   /* made by this provider: no output pointer */
   RM_ERROR_INVALID_WWN = 5,       /* RM_ValidateWwn */
   RM_ERROR_MORE_DATA = 7,         /* list too small, the count holds what is needed */

@@ -5,8 +5,6 @@ using namespace tvx::sim;
 
 namespace {
 
-constexpr RM_STATUS not_supported = 2;
-
 RM_OASLunEntry record_of(const Oas_Entry& entry, const Fault_Effect& effect) {
   RM_OASLunEntry record{};
   write_text(record.fcpLun, sizeof record.fcpLun, std::to_string(entry.lun), effect);
@@ -33,7 +31,7 @@ RM_STATUS LRM_SetOASLunState(HBA_WWN initiator, HBA_WWN, HBA_WWN target, uint64_
                     .target = to_wwn(target),
                     .lun = lun},
                    [=](World&, Port& port, const Fault_Effect&) -> RM_STATUS {
-                     if (!port.oas_supported) return not_supported;
+                     if (!port.oas_supported) return RM_ERROR_NOT_SUPPORTED;
                      if (option > 1 || state > 1) return RM_ERROR;
                      const Oas_Entry entry{to_wwn(target), lun, option, state};
                      const auto found = find_entry(port, entry);
@@ -48,7 +46,7 @@ RM_STATUS LRM_GetOASLunList(HBA_WWN initiator, HBA_WWN, HBA_WWN target, uint32_t
   return port_call(
       {.name = "LRM_GetOASLunList", .port = to_wwn(initiator), .target = to_wwn(target)},
       [=](World&, const Port& port, const Fault_Effect& effect) -> RM_STATUS {
-        if (!port.oas_supported) return not_supported;
+        if (!port.oas_supported) return RM_ERROR_NOT_SUPPORTED;
         if (list == nullptr) return RM_ERROR;
         const std::uint64_t room = list->count;
         std::uint32_t count = 0;

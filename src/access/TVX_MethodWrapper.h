@@ -26,6 +26,14 @@ inline constexpr std::size_t TVX_OS_INFO_SIZE = 40;
 /// Length of an HBA name text: eight pairs of digits and seven colons, without the NUL.
 inline constexpr std::size_t TVX_HBA_NAME_LENGTH = 23;
 
+/// What a port's location indicator can say.
+inline constexpr std::uint16_t TVX_INDICATOR_UNKNOWN = 0;
+inline constexpr std::uint16_t TVX_INDICATOR_ON = 2;
+inline constexpr std::uint16_t TVX_INDICATOR_OFF = 3;
+inline constexpr std::uint16_t TVX_INDICATOR_NOT_SUPPORTED = 4;
+/// Answer of the two beacon operations to an argument that they can't work with.
+inline constexpr int TVX_BEACON_REFUSED = 0x80C8;
+
 /// Turns text names into `HBA_WWN`s, checks that a port is local, calls one entry point, prints its
 /// status and hands it back. All operations but the constructor are static, never throw, take no
 /// lock and return an `RM_STATUS` unless told. They work between `LoadRuntimeLibraries` and
@@ -93,6 +101,15 @@ class TVX_MethodWrapper {
   /// caller owns it
   static RM_STATUS ListVPortAttributes(const HBA_WWN* wwpn, const HBA_WWN& vport,
                                        TVX_Block* attributes);
+
+  /// The beacon of a port as its location indicator; left as it was while the port can't tell.
+  /// @return 0, also when the library fails; TVX_BEACON_REFUSED for arguments that are no good
+  static int GetBeaconState(const char* deviceId, std::uint16_t* indicator);
+  /// Turns the beacon on or off.
+  /// @param indicator TVX_INDICATOR_ON or TVX_INDICATOR_OFF
+  /// @return 0, also when the library fails, which is only logged; TVX_BEACON_REFUSED for any
+  /// other indicator
+  static int SetBeaconState(const HBA_WWN& wwpn, std::uint16_t indicator);
 
   /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
   /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without

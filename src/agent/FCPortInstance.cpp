@@ -57,6 +57,13 @@ void setState(TVXHBA_FCPort& port, const FCPortAttributes& from) {
   port.FECState.set(from.FECState);
 }
 
+/// The beacon, if it can be asked for.
+void setLocationIndicator(TVXHBA_FCPort& port, const char* wwpn) {
+  std::uint16_t indicator = TVX_INDICATOR_UNKNOWN;
+  if (TVX_MethodWrapper::GetBeaconState(wwpn, &indicator) == 0)
+    port.LocationIndicator.set(indicator);
+}
+
 void setCapabilities(TVXHBA_FCPort& port, const FCPortAttributes& from) {
   const Array<std::uint16_t> classes = classesOfService(from.PortSupportedClassofService);
   port.SupportedCOS.set(classes);
@@ -82,6 +89,7 @@ Ref<TVXHBA_FCPort> CreateFCPortInstance(const Port_Build& build) {
   setIdentifyingInfo(*port.get(), build);
   setState(*port.get(), build.attributes);
   setCapabilities(*port.get(), build.attributes);
+  setLocationIndicator(*port.get(), build.port.m_Name.c_str());
   return port;
 }
 

@@ -1,0 +1,40 @@
+// What the methods of the services have in common: how a call begins, and whom it is for.
+#pragma once
+
+#include <cstdint>
+
+#include "agent/ProviderAgent.h"
+#include "generated/Records.h"
+
+namespace cimrt {
+
+/// Results that several methods share.
+inline constexpr std::uint32_t METHOD_OK = 0;
+inline constexpr std::uint32_t METHOD_UNKNOWN_PORT = 32968;
+inline constexpr std::uint32_t METHOD_UNKNOWN_SERVICE = 33068;
+/// A failure of the library is answered as its status above this.
+inline constexpr std::uint32_t METHOD_LIBRARY_FAILURE = 40000;
+
+/// The frame of a method or of a change of the model: asks for a refresh if one is due, waits for
+/// the device tree and the adapter maps, and holds the agent's data lock until it goes. No agent
+/// lock may be held when it is made.
+class Service_Call {
+ public:
+  Service_Call();
+  ProviderAgent& agent;
+
+ private:
+  Ranked_Lock m_Lock;
+};
+
+/// True if the map of a service holds this one, by its keys. An empty map knows every service.
+bool isKnownService(const Instance_Map_Base& map, const Instance* service);
+
+/// The agent's port of that device id, or null with the failure logged. The caller holds the data
+/// lock; the map keeps owning the port.
+TVXHBA_FCPort* findFCPort(ProviderAgent& agent, const char* deviceID);
+/// The same for the target of a method, which may be null or an instance of any class: what is no
+/// port at all gives null with nothing logged.
+TVXHBA_FCPort* findTargetPort(ProviderAgent& agent, const Instance* target);
+
+}  // namespace cimrt
