@@ -1,0 +1,341 @@
+// Every entry point of the management libraries that the provider calls, times every way in which
+// it can fail, while a client asks for everything. The rows run in child processes, so that a crash
+// or a hang is an outcome and not the end.
+//
+// usage: fault_matrix [--every N] [--row TEXT] [--report FILE] [--seconds N]
+//   --every N     of each N cells one, another in each row (1: the whole matrix)
+//   --row TEXT    only entry points whose name holds the text
+//   --report FILE the table in Markdown
+//   --seconds N   a cell that takes longer hangs (default 60)
+// Ends with 1 if a cell crashed, hung or leaked.
+#include <sys/mman.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <chrono>
+#include <csignal>
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iostream>
+#include <nlohmann/json.hpp>
+#include <thread>
+
+#include "Fault_Modes.h"
+#include "Whole_Client.h"
+#include "schema/ClassData.h"
+#include "tests/support/Elf_File.h"
+#include "tvxsim/tvxsim.h"
+
+#if defined(__SANITIZE_ADDRESS__)
+#include <sanitizer/lsan_interface.h>
+#endif
+
+namespace tvx::test {
+namespace {
+
+namespace fs = std::filesystem;
+using Json = nlohmann::json;
+using Clock = std::chrono::steady_clock;
+
+struct Choice {
+  std::size_t every = 1;
+  std::string row;
+  std::string report;
+  std::chrono::seconds patience{60};
+};
+
+/// What a child tells its parent while it runs; lies in memory that both see.
+struct Progress {
+  std::atomic<std::size_t> cell{0};  ///< position of the cell under way
+  std::atomic<std::size_t> cells{0};
+  std::atomic<std::size_t> requests{0};
+  std::atomic<std::size_t> methods{0};
+  std::atomic<std::size_t> libraryCalls{0};
+  std::atomic<std::size_t> leaks{0};
+};
+
+struct Row {
+  std::string entryPoint;
+  std::size_t cells = 0;
+  std::size_t requests = 0;
+  std::size_t methods = 0;
+  std::size_t libraryCalls = 0;
+  std::size_t leaks = 0;
+  std::vector<std::string> crashes;
+  std::vector<std::string> hangs;
+};
+
+// ---- One cell ----
+
+Json scenario() {
+  std::ifstream stream(TVX_MATRIX_SCENARIO);
+  return Json::parse(stream, nullptr, true, true);
+}
+
+/// A folder that is the root of the provider's files while it lives.
+class Trial_Root {
+ public:
+  Trial_Root() {
+    std::string name = (fs::temp_directory_path() / "tvx_fault_XXXXXX").string();
+    if (mkdtemp(name.data()) == nullptr) std::abort();
+    m_Path = name;
+    for (const char* folder : {"etc", "opt/ibm/platform/log", "tmp", "var/log", "files"})
+      fs::create_directories(m_Path / folder);
+    fs::copy_file(TVX_MATRIX_FIRMWARE, m_Path / "files/firmware.img");
+    setenv("TVX_ROOT", m_Path.c_str(), 1);
+  }
+  ~Trial_Root() { fs::remove_all(m_Path); }
+  Trial_Root(const Trial_Root&) = delete;
+  Trial_Root& operator=(const Trial_Root&) = delete;
+
+  std::string files() const { return m_Path / "files"; }
+
+ private:
+  fs::path m_Path;
+};
+
+/// The simulated host, with or without one of its symbols, under one fault.
+void setUp(const std::string& entryPoint, const Fault_Mode* mode) {
+  Json host = scenario();
+  const bool missing = mode != nullptr && mode->isMissingSymbol();
+  if (missing) host["omit_symbols"] = Json::array({entryPoint, "L" + entryPoint});
+  if (tvxsim_load_text(host.dump().c_str()) != 0) {
+    std::cerr << "fault_matrix: " << tvxsim_last_error() << "\n";
+    std::_Exit(3);
+  }
+  if (mode == nullptr || missing) return;
+  const std::string fault = R"({"call": ")" + entryPoint + R"(", )" + mode->members + "}";
+  if (tvxsim_add_fault(fault.c_str()) != 0) {
+    std::cerr << "fault_matrix: " << fault << ": " << tvxsim_last_error() << "\n";
+    std::_Exit(3);
+  }
+}
+
+/// A provider's whole life under one fault.
+void runCell(const host::ClassCatalogue& classes, Progress& progress) {
+  const Trial_Root root;
+  host::BrokerOptions options;
+  options.strict = true;
+  options.classes = &classes;
+  host::Broker broker(options);
+  broker.load(TVX_PROVIDER_LIBRARY);
+  Whole_Client client(broker, classes, root.files());
+  client.readEverything();
+  client.callEverything();
+  client.changeEverything();
+  client.readEverything();
+  broker.unload(true);
+  std::size_t leaks = client.tally().leaks.size();
+  for (const host::ScopeReport& report : broker.threadReports()) leaks += report.leaks() ? 1 : 0;
+  for (const std::string& leak : client.tally().leaks) std::cerr << leak << "\n";
+  progress.leaks += leaks + broker.openAttachments() + broker.lateNotes().size();
+  progress.requests += client.tally().requests;
+  progress.methods += client.tally().methods;
+}
+
+// ---- Rows ----
+
+bool isChosen(const Choice& choice, std::size_t row, std::size_t mode) {
+  return (row + mode) % choice.every == 0;
+}
+
+/// Runs the cells of a row from `first` on; the process's exit status tells of leaked memory.
+[[noreturn]] void runRow(const Choice& choice, const host::ClassCatalogue& classes,
+                         const std::string& entryPoint, std::size_t row, std::size_t first,
+                         Progress& progress) {
+  const std::vector<Fault_Mode> modes = faultModes();
+  for (std::size_t i = first; i < modes.size(); ++i) {
+    if (!isChosen(choice, row, i)) continue;
+    progress.cell = i;
+    setUp(entryPoint, &modes[i]);
+    runCell(classes, progress);
+    progress.libraryCalls += tvxsim_calls(entryPoint.c_str(), nullptr);
+    ++progress.cells;
+  }
+#if defined(__SANITIZE_ADDRESS__)
+  if (__lsan_do_recoverable_leak_check() != 0) ++progress.leaks;
+#endif
+  std::_Exit(0);
+}
+
+enum class End { Done, Crash, Hang };
+
+/// Waits for a child that must keep going from cell to cell.
+End watch(pid_t child, const Choice& choice, const Progress& progress) {
+  std::size_t cell = progress.cells;
+  Clock::time_point since = Clock::now();
+  for (;;) {
+    int status = 0;
+    if (waitpid(child, &status, WNOHANG) == child)
+      return WIFEXITED(status) && WEXITSTATUS(status) == 0 ? End::Done : End::Crash;
+    if (progress.cells != cell) {
+      cell = progress.cells;
+      since = Clock::now();
+    }
+    if (Clock::now() - since > choice.patience) {
+      kill(child, SIGKILL);
+      waitpid(child, &status, 0);
+      return End::Hang;
+    }
+    std::this_thread::sleep_for(std::chrono::milliseconds(2));
+  }
+}
+
+/// Runs a row to its end, however many children that takes.
+Row runRowInChildren(const Choice& choice, const host::ClassCatalogue& classes,
+                     const std::string& entryPoint, std::size_t row, Progress& progress) {
+  new (&progress) Progress;
+  Row result;
+  result.entryPoint = entryPoint;
+  const std::vector<Fault_Mode> modes = faultModes();
+  for (std::size_t first = 0; first < modes.size(); first = progress.cell + 1) {
+    std::cout.flush();
+    const pid_t child = fork();
+    if (child < 0) std::abort();
+    if (child == 0) runRow(choice, classes, entryPoint, row, first, progress);
+    const End end = watch(child, choice, progress);
+    if (end == End::Done) break;
+    auto& list = end == End::Crash ? result.crashes : result.hangs;
+    list.push_back(modes[progress.cell].name);
+    ++progress.cells;
+  }
+  result.cells = progress.cells;
+  result.requests = progress.requests;
+  result.methods = progress.methods;
+  result.libraryCalls = progress.libraryCalls;
+  result.leaks = progress.leaks;
+  return result;
+}
+
+// ---- Which rows ----
+
+/// Names under which the simulated libraries offer something, one for each entry point.
+std::set<std::string> offeredEntryPoints() {
+  std::set<std::string> names;
+  for (const char* library : {TVX_SIM_LRMAPI, TVX_SIM_HBAAPI, TVX_SIM_TVSDM})
+    for (std::string name : Elf_File(library).symbols(true))
+      names.insert(name.starts_with("LRM_") ? name.substr(1) : name);
+  return names;
+}
+
+/// Those that the provider calls when nothing fails. Asked in a child: this process stays without
+/// threads.
+std::vector<std::string> calledEntryPoints(const host::ClassCatalogue& classes,
+                                           Progress& progress) {
+  const std::set<std::string> offered = offeredEntryPoints();
+  int ends[2];
+  if (pipe(ends) != 0) std::abort();
+  const pid_t child = fork();
+  if (child == 0) {
+    setUp("", nullptr);
+    runCell(classes, progress);
+    std::string text;
+    for (const std::string& name : offered)
+      if (tvxsim_calls(name.c_str(), nullptr) > 0) text += name + "\n";
+    const bool written =
+        write(ends[1], text.data(), text.size()) == static_cast<ssize_t>(text.size());
+    std::_Exit(written ? 0 : 1);
+  }
+  close(ends[1]);
+  std::string text;
+  char part[4096];
+  for (ssize_t n = 0; (n = read(ends[0], part, sizeof part)) > 0;)
+    text.append(part, static_cast<std::size_t>(n));
+  close(ends[0]);
+  int status = 0;
+  waitpid(child, &status, 0);
+  if (!WIFEXITED(status) || WEXITSTATUS(status) != 0)
+    throw std::runtime_error("the run without a fault failed");
+  std::istringstream lines(text);
+  std::vector<std::string> names;
+  for (std::string line; std::getline(lines, line);) names.push_back(line);
+  return names;
+}
+
+// ---- The report ----
+
+std::string joined(const std::vector<std::string>& texts) {
+  std::string all;
+  for (const std::string& text : texts) all += (all.empty() ? "" : ", ") + text;
+  return all.empty() ? "0" : std::to_string(texts.size()) + " (" + all + ")";
+}
+
+void writeReport(std::ostream& out, const std::vector<Row>& rows) {
+  Row sum;
+  out << "| Entry point | Cells | Requests | Methods | Calls that a fault met | Crashes | Hangs | "
+         "Leaks |\n|---|---|---|---|---|---|---|---|\n";
+  std::size_t crashes = 0;
+  std::size_t hangs = 0;
+  for (const Row& row : rows) {
+    out << "| `" << row.entryPoint << "` | " << row.cells << " | " << row.requests << " | "
+        << row.methods << " | " << row.libraryCalls << " | " << joined(row.crashes) << " | "
+        << joined(row.hangs) << " | " << row.leaks << " |\n";
+    sum.cells += row.cells;
+    sum.requests += row.requests;
+    sum.methods += row.methods;
+    sum.libraryCalls += row.libraryCalls;
+    sum.leaks += row.leaks;
+    crashes += row.crashes.size();
+    hangs += row.hangs.size();
+  }
+  out << "| all " << rows.size() << " | " << sum.cells << " | " << sum.requests << " | "
+      << sum.methods << " | " << sum.libraryCalls << " | " << crashes << " | " << hangs << " | "
+      << sum.leaks << " |\n";
+}
+
+bool isGood(const Row& row) {
+  return row.crashes.empty() && row.hangs.empty() && row.leaks == 0;
+}
+
+Choice parse(int argc, char** argv) {
+  Choice choice;
+  for (int i = 1; i + 1 < argc; i += 2) {
+    const std::string name = argv[i];
+    const std::string value = argv[i + 1];
+    if (name == "--every") choice.every = std::max(1UL, std::stoul(value));
+    if (name == "--row") choice.row = value;
+    if (name == "--report") choice.report = value;
+    if (name == "--seconds") choice.patience = std::chrono::seconds(std::stol(value));
+  }
+  return choice;
+}
+
+int runMatrix(const Choice& choice) {
+  const host::ClassCatalogue classes(host::allClasses, host::allClassCount);
+  void* memory =
+      mmap(nullptr, sizeof(Progress), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
+  if (memory == MAP_FAILED) throw std::runtime_error("there is no shared memory");
+  Progress& progress = *new (memory) Progress;
+  std::vector<Row> rows;
+  std::size_t position = 0;
+  bool good = true;
+  for (const std::string& name : calledEntryPoints(classes, progress)) {
+    ++position;
+    if (name.find(choice.row) == std::string::npos) continue;
+    rows.push_back(runRowInChildren(choice, classes, name, position, progress));
+    const Row& row = rows.back();
+    good = good && isGood(row);
+    std::cout << name << ": " << row.cells << " cells, " << row.requests << " requests, crashes "
+              << joined(row.crashes) << ", hangs " << joined(row.hangs) << ", leaks " << row.leaks
+              << "\n";
+  }
+  if (!choice.report.empty()) {
+    std::ofstream report(choice.report);
+    writeReport(report, rows);
+  }
+  std::cout << rows.size() << " entry points, " << (good ? "all good" : "NOT all good") << "\n";
+  return good && !rows.empty() ? 0 : 1;
+}
+
+}  // namespace
+}  // namespace tvx::test
+
+int main(int argc, char** argv) {
+  try {
+    return tvx::test::runMatrix(tvx::test::parse(argc, argv));
+  } catch (const std::exception& error) {
+    std::cerr << "fault_matrix: " << error.what() << "\n";
+    return 2;
+  }
+}

@@ -1,0 +1,70 @@
+// Method calls that make sense, so that a fault in the library underneath has something to break.
+#include "Whole_Client.h"
+
+namespace tvx::test {
+
+std::vector<Method_Call> purposefulCalls(const std::string& folder) {
+  const std::string port = "Target=$TVXHBA_FCPort";
+  const std::string file = "URI=file://" + folder + "/";
+  return {
+      {"TVXHBA_BootBIOSService", "GetBootBIOSStatus", {port, "nBootBIOSStatus=0"}},
+      {"TVXHBA_BootBIOSService", "EnableBootBIOS", {port}},
+      {"TVXHBA_BootBIOSService", "DisableBootBIOS", {port}},
+      {"TVXHBA_DumpService", "GenerateDump", {port}},
+      {"TVXHBA_DumpService", "GetDumpFileNames", {port}},
+      {"TVXHBA_DumpService", "DeleteDump", {port}},
+      {"TVXHBA_FCHBADriverParamService",
+       "SetDriverParameter",
+       {port, "bPermanent=false", "bGlobal=false", "strParam=queue-depth", "strValue=32"}},
+      {"TVXHBA_FCHBADriverParamService",
+       "SetDriverParameter",
+       {port, "bPermanent=true", "bGlobal=true", "strParam=queue-depth", "strValue=0x20"}},
+      {"TVXHBA_FCHBADriverParamService",
+       "DisableAllOASLuns",
+       {"InitiatorWWPN=10000254560C4110", "TargetWWPN=500C0FF12A001001"}},
+      {"TVXHBA_FCHBAWWNService", "GetWWNCapability", {port}},
+      {"TVXHBA_FCHBAWWNService", "ReadWWN", {port, "Type=1"}},
+      {"TVXHBA_FCHBAWWNService", "ReadWWN", {port, "Type=2"}},
+      {"TVXHBA_FCHBAWWNService", "ReadWWN", {port, "Type=3"}},
+      {"TVXHBA_FCHBAWWNService", "ReadWWN", {port, "Type=4"}},
+      {"TVXHBA_FCHBAWWNService",
+       "ChangeWWN",
+       {port, "NewWWPN=1000025456AAAA01", "NewWWNN=2000025456AAAA01", "Type=0"}},
+      {"TVXHBA_FCHBAWWNService",
+       "ChangeWWN",
+       {port, "NewWWPN=1000025456AAAA02", "NewWWNN=2000025456AAAA02", "Type=1"}},
+      {"TVXHBA_FCHBAWWNService", "RestoreWWN", {port, "Type=2"}},
+      {"TVXHBA_FCHBAWWNService", "RestoreWWN", {port, "Type=3"}},
+      {"TVXHBA_FCTagService", "GetGlobalFlag", {port}},
+      {"TVXHBA_FCTagService", "SetGlobalFlag", {port, "State=1"}},
+      {"TVXHBA_FCTagService", "GetConfigTable", {port, file + "table.xml"}},
+      {"TVXHBA_FCTagService", "SetConfigTable", {port, file + "table.xml"}},
+      {"TVXHBA_SoftwareInstallationService", "SetPortEnabled", {port, "PortEnabled=true"}},
+      {"TVXHBA_SoftwareInstallationService", "SetPortEnabled", {port, "PortEnabled=false"}},
+      {"TVXHBA_SoftwareInstallationService", "GetHBAFeatures", {port}},
+      {"TVXHBA_SoftwareInstallationService", "SetFECState", {port, "EnableFlag=true"}},
+      {"TVXHBA_SoftwareInstallationService", "ResetHBA", {port}},
+      {"TVXHBA_SoftwareInstallationService",
+       "CheckSoftwareIdentity",
+       {"Source=$TVXHBA_SoftwareIdentity", "Target=$TVXHBA_FCPort"}},
+      {"TVXHBA_SoftwareInstallationService",
+       "InstallFromURI",
+       {file + "firmware.img", "Target=$TVXHBA_FCPort", "InstallOptions=[2]",
+        "InstallOptionsValues=[\"\"]"}},
+      {"TVXHBA_SoftwareInstallationService",
+       "InstallFromByteStream",
+       {"Image=[1,2,3,4,5,6,7,8]", "Target=$TVXHBA_FCPort", "InstallOptions=[2]",
+        "InstallOptionsValues=[\"\"]"}},
+      {"TVXHBA_FCHBADiagnosticTest", "RunDiagnosticService", {"ManagedElement=$TVXHBA_FCPort"}},
+      {"TVXHBA_FCHBADiagnosticTest", "RunDiagnostic", {"ManagedElement=$TVXHBA_FCPort"}},
+      {"TVXHBA_HelpService", "GetHelp", {"RequestedDocument=", "RequestedDelivery=2"}},
+      {"TVXHBA_DiagnosticsLog", "ClearLog", {}},
+      {"TVXHBA_RecordLog",
+       "SetLogParams",
+       {"LogLevel=3", "LogMode=1", "TracePath=" + folder + "/trace"}},
+      {"TVXHBA_RecordLog", "RequestStateChange", {"RequestedState=2"}},
+      {"TVXHBA_RecordLog", "ClearLog", {}},
+  };
+}
+
+}  // namespace tvx::test

@@ -1,0 +1,106 @@
+#include "Whole_Client.h"
+
+#include "cli/Arguments.h"
+#include "cli/ExitCode.h"
+
+namespace tvx::test {
+
+using host::ClassData;
+using host::ObjectPath;
+using host::Reply;
+using host::Request;
+
+void Client_Tally::add(const Client_Tally& other) {
+  requests += other.requests;
+  instances += other.instances;
+  methods += other.methods;
+  for (const auto& [status, number] : other.byStatus) byStatus[status] += number;
+  leaks.insert(leaks.end(), other.leaks.begin(), other.leaks.end());
+}
+
+Whole_Client::Whole_Client(host::Broker& broker, const host::ClassCatalogue& classes,
+                           std::string folder)
+    : m_Broker(broker), m_Classes(classes), m_Folder(std::move(folder)) {}
+
+Reply Whole_Client::count(Reply reply, const std::string& what) {
+  ++m_Tally.requests;
+  ++m_Tally.byStatus[reply.status.rc];
+  m_Tally.instances += reply.instances.size();
+  if (reply.report.leaks()) m_Tally.leaks.push_back(what + ": " + reply.report.text());
+  return reply;
+}
+
+void Whole_Client::readEverything() {
+  for (const ClassData* each : m_Classes.all()) {
+    if (!each->isServed) continue;
+    const std::string name = each->name;
+    count(m_Broker.enumerateInstanceNames(name), "names of " + name);
+    const Reply all = count(m_Broker.enumerateInstances(name), "instances of " + name);
+    m_First.erase(name);
+    if (all.instances.empty()) continue;
+    const ObjectPath path = all.instances.front().path;
+    m_First[name] = path;
+    count(m_Broker.getInstance(path), "instance of " + name);
+    if (!each->isAssociation) count(m_Broker.associatorNames(path), "neighbours of " + name);
+  }
+}
+
+const ObjectPath* Whole_Client::firstOf(const std::string& className) {
+  const auto found = m_First.find(className);
+  return found == m_First.end() ? nullptr : &found->second;
+}
+
+void Whole_Client::callBare(const ClassData& classData) {
+  const ObjectPath* first = firstOf(classData.name);
+  ObjectPath path;
+  path.className = classData.name;
+  for (const host::MethodData& method : host::methods(classData)) {
+    ++m_Tally.methods;
+    count(m_Broker.invokeMethod(first ? *first : path, method.name),
+          std::string(classData.name) + "." + method.name);
+  }
+}
+
+void Whole_Client::call(const Method_Call& call) {
+  const ClassData* classData = m_Classes.find(call.className);
+  const host::MethodData* method = host::findMethod(*classData, call.method);
+  const ObjectPath* object = firstOf(call.className);
+  if (object == nullptr) return;  // a host that is in trouble shows no such service
+  try {
+    const auto arguments = host::parseArguments(
+        *classData, *method, call.arguments, m_Classes, [this](const std::string& text) {
+          const ObjectPath* first = firstOf(text.substr(1));
+          if (first == nullptr) throw host::CommandError(host::ExitCode::NotFound, text);
+          return *first;
+        });
+    ++m_Tally.methods;
+    count(m_Broker.invokeMethod(*object, method->name, arguments),
+          std::string(call.className) + "." + call.method);
+  } catch (const host::CommandError&) {
+    // The instance that the call is about is not there.
+  }
+}
+
+void Whole_Client::callEverything() {
+  for (const ClassData* each : m_Classes.all())
+    if (each->isServed) callBare(*each);
+  for (const Method_Call& each : purposefulCalls(m_Folder)) call(each);
+}
+
+void Whole_Client::changeEverything() {
+  for (const char* name : {"TVXHBA_ProviderConfigSetting", "TVXHBA_FCPort", "TVXHBA_DriverParams",
+
+                           "TVXHBA_DriverParamGlobal", "TVXHBA_DumpData", "TVXHBA_VirtualFCPort"}) {
+    const ClassData* classData = m_Classes.find(name);
+    const ObjectPath* first = firstOf(name);
+    if (classData == nullptr || first == nullptr) continue;
+    const Reply found = count(m_Broker.getInstance(*first), std::string("get ") + name);
+    if (found.instances.empty()) continue;
+    host::Instance instance = found.instances.front();
+    count(m_Broker.modifyInstance(instance), std::string("modify ") + name);
+    count(m_Broker.createInstance(instance), std::string("create ") + name);
+    count(m_Broker.deleteInstance(*first), std::string("delete ") + name);
+  }
+}
+
+}  // namespace tvx::test
