@@ -151,11 +151,4 @@ std::int32_t ProviderAgent::updateAdapterMaps() {
   return 0;
 }
 
-std::int32_t ProviderAgent::updateSANMaps() {
-  TVX_LOG(TVX_DBG, "PERF: updateSANMaps: Entry");
-  clearSANMaps();
-  TVX_LOG(TVX_DBG, "PERF: updateSANMaps: cleanExit");
-  return 0;
-}
-
 }  // namespace cimrt

@@ -24,15 +24,14 @@ bool insertInstance(Instance_Map_Base& map, Ref<Instance> instance, const char* 
   return true;
 }
 
-void setEnds(Instance* association, const Instance* first, const Instance* second) {
-  const Instance* ends[] = {first, second};
-  std::size_t next = 0;
+void setEnds(Instance* association, std::initializer_list<const Instance*> ends) {
+  const Instance* const* next = ends.begin();
   const Meta_Class* meta = class_of(association);
-  for (std::uint64_t i = 0; i < meta->num_meta_features && next < 2; i++) {
+  for (std::uint64_t i = 0; i < meta->num_meta_features && next != ends.end(); i++) {
     const Meta_Feature* feature = meta->meta_features[i];
     if (!is_reference(feature)) continue;
     auto** field = static_cast<Instance**>(storage(association, feature));
-    set_reference(*field, clone(ends[next++]));
+    set_reference(*field, clone(*next++));
   }
 }
 

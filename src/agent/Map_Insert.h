@@ -4,7 +4,9 @@
 // out stay owned by their map.
 #pragma once
 
+#include <initializer_list>
 #include <string>
+#include <utility>
 
 #include "agent/MapBuild.h"
 
@@ -32,8 +34,11 @@ T* insertInto(Instance_Map<T>& map, Ref<T> instance, const char* failure) {
   return insertInstance(map, Ref<Instance>(instance.release()), failure) ? entry : nullptr;
 }
 
-/// Puts clones of the two ends into the references of `association`, in the order of its class.
-void setEnds(Instance* association, const Instance* first, const Instance* second);
+/// Puts clones of the ends into the references of `association`, in the order of its class.
+void setEnds(Instance* association, std::initializer_list<const Instance*> ends);
+inline void setEnds(Instance* association, const Instance* first, const Instance* second) {
+  setEnds(association, {first, second});
+}
 
 /// A new association between clones of two instances, in the provider's namespace. The caller owns
 /// it.
@@ -51,6 +56,16 @@ T* associate(Instance_Map<T>& map, const Instance* first, const Instance* second
              const char* failure) {
   if (!first || !second) return nullptr;
   return insertInto(map, makeAssociation<T>(first, second), failure);
+}
+
+/// The same for an association of three ends.
+template <class T>
+T* associate(Instance_Map<T>& map, const Instance* first, const Instance* second,
+             const Instance* third, const char* failure) {
+  if (!first || !second || !third) return nullptr;
+  Ref<T> association = makeInstance<T>();
+  setEnds(association.get(), {first, second, third});
+  return insertInto(map, std::move(association), failure);
 }
 
 /// The first entry of a map whose text property has that value, or null.
