@@ -12,16 +12,17 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <atomic>
 #include <chrono>
 #include <csignal>
 #include <cstdlib>
-#include <filesystem>
 #include <fstream>
 #include <iostream>
 #include <nlohmann/json.hpp>
 #include <thread>
 
 #include "Fault_Modes.h"
+#include "Trial_Root.h"
 #include "Whole_Client.h"
 #include "schema/ClassData.h"
 #include "tests/support/Elf_File.h"
@@ -34,7 +35,6 @@
 namespace tvx::test {
 namespace {
 
-namespace fs = std::filesystem;
 using Json = nlohmann::json;
 using Clock = std::chrono::steady_clock;
 
@@ -72,28 +72,6 @@ Json scenario() {
   std::ifstream stream(TVX_MATRIX_SCENARIO);
   return Json::parse(stream, nullptr, true, true);
 }
-
-/// A folder that is the root of the provider's files while it lives.
-class Trial_Root {
- public:
-  Trial_Root() {
-    std::string name = (fs::temp_directory_path() / "tvx_fault_XXXXXX").string();
-    if (mkdtemp(name.data()) == nullptr) std::abort();
-    m_Path = name;
-    for (const char* folder : {"etc", "opt/ibm/platform/log", "tmp", "var/log", "files"})
-      fs::create_directories(m_Path / folder);
-    fs::copy_file(TVX_MATRIX_FIRMWARE, m_Path / "files/firmware.img");
-    setenv("TVX_ROOT", m_Path.c_str(), 1);
-  }
-  ~Trial_Root() { fs::remove_all(m_Path); }
-  Trial_Root(const Trial_Root&) = delete;
-  Trial_Root& operator=(const Trial_Root&) = delete;
-
-  std::string files() const { return m_Path / "files"; }
-
- private:
-  fs::path m_Path;
-};
 
 /// The simulated host, with or without one of its symbols, under one fault.
 void setUp(const std::string& entryPoint, const Fault_Mode* mode) {

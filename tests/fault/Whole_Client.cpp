@@ -30,19 +30,21 @@ Reply Whole_Client::count(Reply reply, const std::string& what) {
   return reply;
 }
 
+void Whole_Client::readClass(const ClassData& classData) {
+  const std::string name = classData.name;
+  count(m_Broker.enumerateInstanceNames(name), "names of " + name);
+  const Reply all = count(m_Broker.enumerateInstances(name), "instances of " + name);
+  m_First.erase(name);
+  if (all.instances.empty()) return;
+  const ObjectPath path = all.instances.front().path;
+  m_First[name] = path;
+  count(m_Broker.getInstance(path), "instance of " + name);
+  if (!classData.isAssociation) count(m_Broker.associatorNames(path), "neighbours of " + name);
+}
+
 void Whole_Client::readEverything() {
-  for (const ClassData* each : m_Classes.all()) {
-    if (!each->isServed) continue;
-    const std::string name = each->name;
-    count(m_Broker.enumerateInstanceNames(name), "names of " + name);
-    const Reply all = count(m_Broker.enumerateInstances(name), "instances of " + name);
-    m_First.erase(name);
-    if (all.instances.empty()) continue;
-    const ObjectPath path = all.instances.front().path;
-    m_First[name] = path;
-    count(m_Broker.getInstance(path), "instance of " + name);
-    if (!each->isAssociation) count(m_Broker.associatorNames(path), "neighbours of " + name);
-  }
+  for (const ClassData* each : m_Classes.all())
+    if (each->isServed) readClass(*each);
 }
 
 const ObjectPath* Whole_Client::firstOf(const std::string& className) {

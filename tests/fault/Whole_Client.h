@@ -40,10 +40,14 @@ class Whole_Client {
  public:
   Whole_Client(host::Broker& broker, const host::ClassCatalogue& classes, std::string folder);
 
-  /// Names and instances of every class, one instance of each by its path, its associations.
+  /// Names and instances of one class, one instance by its path, and what it is associated with.
+  void readClass(const host::ClassData& classData);
+  /// The same of every class.
   void readEverything();
   /// Every method of every class, without arguments; then the purposeful calls.
   void callEverything();
+  /// One call. A host that lacks the instances that it is about is not asked.
+  void call(const Method_Call& call);
   /// What the client may change otherwise: settings, entries that it makes and removes.
   void changeEverything();
 
@@ -53,7 +57,6 @@ class Whole_Client {
   host::Reply count(host::Reply reply, const std::string& what);
   const host::ObjectPath* firstOf(const std::string& className);
   void callBare(const host::ClassData& classData);
-  void call(const Method_Call& call);
 
   host::Broker& m_Broker;
   const host::ClassCatalogue& m_Classes;
