@@ -1,6 +1,4 @@
 // Port statistics, which move with time or by the script of the scenario.
-#include <ctime>
-
 #include "lrmapi/Call.h"
 
 using namespace tvx::sim;
@@ -24,8 +22,7 @@ extern "C" {
 RM_STATUS LRM_GetPortStatistics(HBA_WWN wwpn, void* block, uint32_t* size) {
   return port_call("LRM_GetPortStatistics", wwpn,
                    [=](const World& world, Port& port, const Fault_Effect& effect) {
-                     const auto now = static_cast<std::int64_t>(std::time(nullptr));
-                     const std::int64_t seconds = now - world.made_at + world.advanced;
+                     const std::int64_t seconds = counter_seconds(world);
                      Attribute_Map values;
                      for (auto& [id, counter] : port.counters) {
                        values[id] = number64_value(read_counter(counter, seconds));

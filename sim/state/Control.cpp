@@ -77,6 +77,13 @@ void tvxsim_advance(unsigned seconds) {
   });
 }
 
+void tvxsim_hold_clock(int held) {
+  report([held] {
+    Simulation::instance().with_world([held](World& world) { world.clock_held = held != 0; });
+    return std::string();
+  });
+}
+
 int tvxsim_set_link(const char* wwpn, const char* json) {
   return report([=] {
     const std::optional<Wwn> name = parse_wwn(wwpn ? wwpn : "");

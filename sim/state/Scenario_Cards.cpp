@@ -196,11 +196,10 @@ Port read_port(const Json_Reader& reader, const Json_Reader& card_reader, World&
   port.number = number;
   read_names(reader, port, port.card, world.ports.size());
   make_link(port);
+  const Card& card = world.cards.back();
+  port.symbolic_name = card.node_symbolic_name + " PORT-" + std::to_string(number);
   read_link(reader, port);
   read_port_card_values(reader, card_values, port);
-  const Card& card = world.cards.back();
-  port.symbolic_name =
-      reader.text("symbolic_name", card.node_symbolic_name + " PORT-" + std::to_string(number));
   read_attributes(card_reader, "attributes", card_attribute_rows(), port.card_values, port.omitted);
   read_attributes(reader, "adapter_attributes", card_attribute_rows(), port.card_values,
                   port.omitted);
@@ -233,6 +232,7 @@ void append_adapters(const Json_Reader& card, World& world, std::size_t first_po
 void read_link(const Json_Reader& reader, Port& port) {
   port.fc_id = reader.number<std::uint32_t>("fc_id", port.fc_id);
   port.fabric_name = reader.wwn("fabric_name", port.fabric_name);
+  port.symbolic_name = reader.text("symbolic_name", port.symbolic_name);
   port.type = reader.choice("type", port.type, port_types);
   port.state = reader.choice("state", port.state, port_states);
   port.hba_state = reader.choice("hba_state", port.hba_state, port_states);

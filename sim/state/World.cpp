@@ -1,5 +1,8 @@
 #include "state/World.h"
 
+#include <algorithm>
+#include <ctime>
+
 namespace tvx::sim {
 namespace {
 
@@ -13,6 +16,11 @@ Port* World::find_port(const Wwn& name) {
     if (port.names.port == name) return &port;
   }
   return nullptr;
+}
+
+std::int64_t counter_seconds(const World& world) {
+  if (world.clock_held) return world.advanced;
+  return static_cast<std::int64_t>(std::time(nullptr)) - world.made_at + world.advanced;
 }
 
 bool link_is_up(const Port& port) {

@@ -244,6 +244,7 @@ struct World {
   std::uint32_t next_diagnostic = 1;
   std::int64_t made_at = 0;                      ///< seconds of the clock when the world was made
   std::int64_t advanced = 0;                     ///< seconds that the clock was put forward since
+  bool clock_held = false;                       ///< the clock shows `advanced` alone
   std::map<std::uint32_t, std::size_t> handles;  ///< open SNIA handles, to adapter indices
   std::map<std::uint32_t, std::size_t> qos_handles;  ///< the same of the frame tagging library
   std::uint32_t next_handle = 1;
@@ -264,6 +265,8 @@ void activate(Port& port, Activation event);
 Attribute_Map adapter_attributes(const Port& port);
 /// The attributes that LRM_GetPortAttributes reports.
 Attribute_Map port_attributes(const Port& port);
+/// Seconds on the clock of the counters since the world was made.
+std::int64_t counter_seconds(const World& world);
 /// The port state as the SNIA library tells it.
 std::uint32_t hba_port_state(const Port& port);
 

@@ -1,6 +1,7 @@
 // The port itself, with its places in system and group, and its statistics.
 #include "access/TVX_MethodWrapper.h"
 #include "agent/FCPortTables.h"
+#include "agent/LiveStatus.h"
 #include "agent/MapSteps.h"
 #include "agent/Map_Insert.h"
 
@@ -18,7 +19,6 @@ void setNames(TVXHBA_FCPort& port, const Port_Build& build) {
   port.DeviceID.set(wwpn);
   port.PermanentAddress.set(wwpn);
   port.NetworkAddresses.set({wwpn});
-  port.ElementName.set(build.attributes.PortSymbolicName.c_str());
   port.AdapterName.set(build.adapter.adapter.m_Name.c_str());
 }
 
@@ -44,14 +44,8 @@ void setIdentifyingInfo(TVXHBA_FCPort& port, const Port_Build& build) {
 }
 
 void setState(TVXHBA_FCPort& port, const FCPortAttributes& from) {
-  const Port_Type& type = portType(from.PortType);
-  port.PortType.set(type.portType);
-  port.OtherPortType.set(type.otherPortType);
-  const Port_Status& status = portStatus(from.PortState);
-  port.OperationalStatus.set({status.operationalStatus});
-  port.StatusDescriptions.set({status.description});
+  setLinkState(port, from);
   port.FCID.set(from.PortFcId);
-  port.FabricName.set(from.FabricName.c_str());
   port.NumberOfDiscoveredPorts.set(from.NumberofDiscoveredPorts);
   port.FWDownloadStatus.set(0);
   port.FECState.set(from.FECState);
@@ -70,7 +64,6 @@ void setCapabilities(TVXHBA_FCPort& port, const FCPortAttributes& from) {
   port.ActiveCOS.set(classes);
   port.SupportedFC4Types.set(fc4Types(from.PortSupportedFc4Types));
   port.ActiveFC4Types.set(fc4Types(from.PortActiveFc4Types));
-  port.Speed.set(portSpeed(from.PortSpeed));
   port.MaxSpeed.set(maxPortSpeed(from.PortSupportedSpeed));
   port.LinkTechnology.set(4);
   port.SupportedMaximumTransmissionUnit.set(from.PortMaxFrameSize);

@@ -23,6 +23,14 @@ std::uint64_t testClock() {
 }
 
 constexpr std::uint64_t START_OF_TIME = 1'700'000'000'000'000;
+constexpr std::uint64_t PAUSE = 3'600'000'000;
+
+/// Each test starts later than all before it: the throttles of the live updates are the process's.
+std::uint64_t nextStart() {
+  static std::uint64_t start = START_OF_TIME;
+  start += PAUSE;
+  return std::max(start, clockUsec + PAUSE);
+}
 
 }  // namespace
 
@@ -70,7 +78,7 @@ void Agent_Test::SetUp() {
   std::filesystem::create_directories(root / "etc");
   std::filesystem::create_directories(root / "opt/ibm/platform/log");
   setenv("TVX_ROOT", root.c_str(), 1);
-  clockUsec = START_OF_TIME;
+  clockUsec = nextStart();
   tvxSetClock(testClock);
   getLogger().clearDefaultLog();
   getLogger().enable();

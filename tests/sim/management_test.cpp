@@ -28,6 +28,23 @@ TEST_F(Management, StatisticsFitTheBufferAndMoveWithTimeOrScript) {
   EXPECT_EQ(block.u64(RM_PS_NOS_COUNT), 9u);
 }
 
+TEST_F(Management, HeldClockMovesCountersOnlyWhenItIsPutForward) {
+  load_port(R"("statistics": {"tx_frames": {"start": 100, "per_second": 10}})");
+  tvxsim_hold_clock(1);
+  Block block(rm, RM_PORT_STATISTICS_SIZE);
+  const auto frames = [&] {
+    block.size = RM_PORT_STATISTICS_SIZE;
+    EXPECT_EQ(SIM_CALL(rm, LRM_GetPortStatistics, first_port, block.data(), &block.size), 0);
+    return block.u64(RM_PS_TX_FRAMES);
+  };
+  EXPECT_EQ(frames(), 100u);
+  tvxsim_advance(3);
+  EXPECT_EQ(frames(), 130u);
+  EXPECT_EQ(frames(), 130u);
+  tvxsim_hold_clock(0);
+  EXPECT_GE(frames(), 130u);
+}
+
 TEST_F(Management, AllCountersOfTheInterfaceAreThere) {
   Block block(rm, RM_PORT_STATISTICS_SIZE);
   ASSERT_EQ(SIM_CALL(rm, LRM_GetPortStatistics, first_port, block.data(), &block.size), 0);

@@ -34,8 +34,11 @@ void tvxsim_clear_faults(void);
 unsigned long tvxsim_calls(const char* entry_point, const char* wwpn);
 void tvxsim_forget_calls(void);
 
-/* Puts the clock of the counters forward. */
+/* Puts the clock of the counters forward, which moves with time otherwise. */
 void tvxsim_advance(unsigned seconds);
+/* Makes that clock show the seconds that it was put forward, and no time that passed; 0 lets time
+ * count again. A new world starts with a clock that moves with time. */
+void tvxsim_hold_clock(int held);
 
 /* Changes the link of a port: an object with the members of a scenario's port that tell of its
  * link, such as {"state": "link down", "speed": "unknown"}. 0, or -1 if the port or the object is
