@@ -15,12 +15,8 @@ case "$what" in
 esac
 [ "$(id -u)" -eq 0 ] || { echo "fresh_debian: run as root (it uses debootstrap and chroot)" >&2; exit 1; }
 
-if [ ! -x "$target/usr/bin/apt-get" ]; then
-  step "a minimal Debian 12 in $target"
-  mkdir -p "$target"
-  debootstrap --variant=minbase bookworm "$target" "${TVX_MIRROR:-http://deb.debian.org/debian}" >"$target.log" 2>&1 ||
-    { tail "$target.log" >&2; exit 1; }
-fi
+. "$(dirname "$0")/fresh_root.sh"
+make_root "$target"
 if [ -z "${TVX_REUSE:-}" ]; then
   rm -rf "$target/opt/tree"
   mkdir -p "$target/opt/tree"
@@ -28,8 +24,4 @@ if [ -z "${TVX_REUSE:-}" ]; then
 fi
 
 step "scripts/$what.sh there"
-for file in /etc/resolv.conf /etc/apt/apt.conf.d/*proxy*; do
-  if [ -e "$file" ]; then install -D -m 644 "$file" "$target$file"; fi
-done
-unshare --mount --pid --fork --root="$target" --mount-proc --wd=/ \
-  /bin/sh -c "cd /opt/tree && git --version >/dev/null 2>&1; HOME=/root exec scripts/$what.sh"
+run_in_root "$target" "cd /opt/tree && git --version >/dev/null 2>&1; HOME=/root exec scripts/$what.sh"

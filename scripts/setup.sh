@@ -1,16 +1,18 @@
 #!/usr/bin/env bash
 # Installs the Debian packages that building, the demo or the tests need, and only those that are missing.
 #
-# usage: scripts/setup.sh [demo|test]     demo: build and run (default); test: that and everything the tests use
+# usage: scripts/setup.sh [demo|package|test]   demo: build and run (default); package: that and Debian packages;
+#                                               test: that and everything the tests use
 set -euo pipefail
 
 case "${1:-demo}" in
-  -h|--help) sed -n '2,5p' "$0" | sed 's/^# \{0,1\}//'; exit 0 ;;
-  demo|test) what=${1:-demo} ;;
-  *) echo "setup: unknown argument '$1'; use 'demo' or 'test'" >&2; exit 2 ;;
+  -h|--help) sed -n '2,6p' "$0" | sed 's/^# \{0,1\}//'; exit 0 ;;
+  demo|package|test) what=${1:-demo} ;;
+  *) echo "setup: unknown argument '$1'; use 'demo', 'package' or 'test'" >&2; exit 2 ;;
 esac
 
 packages=(g++ cmake ninja-build ccache python3 nlohmann-json3-dev libcli11-dev libfmt-dev)
+[ "$what" != package ] || packages+=(dpkg-dev file gzip lintian)
 if [ "$what" = test ]; then
   packages+=(libgtest-dev libgmock-dev libbenchmark-dev libpugixml-dev libmicrohttpd-dev librapidxml-dev
              libhbaapi-dev libhbaapi2 libcurl4 sblim-wbemcli binutils util-linux
