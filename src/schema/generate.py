@@ -3,6 +3,7 @@
 
     generate.py --output FOLDER     write the generated files
     generate.py --check             only read and check the descriptions
+    generate.py --reference FILE    write the class reference for people
 
 The schema folder holds *.mof, catalogue.txt and agent_maps.txt; the providers file says how classes are served. A mistake in one of them is reported as
 "file:line: what is wrong" and ends the program with status 1. Files whose text does not change are not touched.
@@ -14,8 +15,8 @@ from pathlib import Path
 
 sys.dont_write_bytecode = True
 
-from generator import (catalogue, class_model, emit_host, emit_methods, emit_module, emit_records, emit_repository,
-                       mof_reader)
+from generator import (catalogue, class_model, emit_host, emit_methods, emit_module, emit_records, emit_reference,
+                       emit_repository, mof_reader)
 from generator.errors import SchemaError
 from generator.writer import Output
 
@@ -49,15 +50,20 @@ def main(words=None):
     parser.add_argument("--providers", type=Path, default=here.parent / "derivedObjects" / "providers.txt")
     parser.add_argument("--output", type=Path)
     parser.add_argument("--check", action="store_true")
+    parser.add_argument("--reference", type=Path)
     arguments = parser.parse_args(words)
-    if not arguments.check and arguments.output is None:
-        parser.error("--output or --check is needed")
+    if not arguments.check and arguments.output is None and arguments.reference is None:
+        parser.error("--output, --reference or --check is needed")
     try:
         classes, rows = read_schema(arguments.schema)
         maps = emit_records.read_maps(arguments.schema / "agent_maps.txt", classes)
         served = [row.name for row in rows]
         servings = emit_module.read_providers(arguments.providers, served)
-        if not arguments.check:
+        texts = emit_reference.read_descriptions(arguments.schema / "descriptions.txt", set(served))
+        page = emit_reference.reference(classes, served, servings, texts)
+        if arguments.reference is not None:
+            arguments.reference.write_text(page, encoding="utf-8")
+        if not arguments.check and arguments.output is not None:
             generate(classes, served, maps, servings, Output(arguments.output))
     except SchemaError as error:
         print(error, file=sys.stderr)
