@@ -34,6 +34,18 @@ inline constexpr std::uint16_t TVX_INDICATOR_NOT_SUPPORTED = 4;
 /// Answer of the two beacon operations to an argument that they can't work with.
 inline constexpr int TVX_BEACON_REFUSED = 0x80C8;
 
+/// Whose parameters: those of one port, or those of the driver as a whole.
+enum class TVX_Driver_Scope { LOCAL, GLOBAL };
+
+/// Parameters as the library lists them. Their texts need not be terminated.
+struct TVX_Driver_Params {
+  TVX_Block block;          ///< `count` records of `RM_DriverParam`
+  std::uint32_t count = 0;  ///< never more than the block holds
+  const RM_DriverParam& operator[](std::uint32_t i) const {
+    return reinterpret_cast<const RM_DriverParam*>(block.get())[i];
+  }
+};
+
 /// Turns text names into `HBA_WWN`s, checks that a port is local, calls one entry point, prints its
 /// status and hands it back. All operations but the constructor are static, never throw, take no
 /// lock and return an `RM_STATUS` unless told. They work between `LoadRuntimeLibraries` and
@@ -110,6 +122,35 @@ class TVX_MethodWrapper {
   /// @return 0, also when the library fails, which is only logged; TVX_BEACON_REFUSED for any
   /// other indicator
   static int SetBeaconState(const HBA_WWN& wwpn, std::uint16_t indicator);
+
+  /// The parameters of the driver, for one port or for all, asked for through a port. Status 7 or
+  /// 191 has the list read once more with the room that it needs. The status, or
+  /// RM_ERROR_NO_MEMORY; each failure is logged.
+  /// @param params left as it was on failure
+  static RM_STATUS ReadDriverParams(const HBA_WWN& wwpn, TVX_Driver_Scope scope,
+                                    TVX_Driver_Params* params);
+  /// Sets one parameter.
+  /// @param deviceId name of the port, for the log alone
+  /// @param cw1 1: the driver's parameter, 0: the port's
+  /// @param cw2 1: the change outlives a reboot, 0: until then
+  /// @return the library's status; 1 for a port that is not local, or wrong arguments
+  static RM_STATUS tvxcimSetDriverParam(const char* deviceId, const HBA_WWN* wwpn,
+                                        std::uint32_t cw1, std::uint32_t cw2, const char* parameter,
+                                        const char* value);
+
+  /// Marks a unit for optimized access, or takes the mark away.
+  /// @param initiator, port, target device ids; without virtual ports the first two are the same
+  /// @param lunText the unit's number in decimal
+  /// @param state 1 or 0
+  /// @param option 0: in the driver, 1: in the stored configuration
+  static RM_STATUS SetOASLunState(const char* initiator, const char* port, const char* target,
+                                  const char* lunText, std::uint8_t state, std::uint32_t option);
+  /// The units that are marked behind a target; arguments as above. The status, RM_ERROR_NO_MEMORY,
+  /// or 1 for names that can't be converted.
+  /// @param list takes an `RM_OASLunList` whose count never exceeds what it holds; the caller owns
+  /// it; left as it was on failure
+  static RM_STATUS GetOASLunList(const char* initiator, const char* port, const char* target,
+                                 std::uint32_t option, TVX_Block* list);
 
   /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
   /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without

@@ -114,6 +114,7 @@ constexpr Build_Step<Host_Build> CARD_STEPS[] = {
     buildProviderConfigSettings,
     startServices,
     buildAdapters,
+    buildDriverParameters,
     buildVirtualPorts,
 };
 // clang-format on

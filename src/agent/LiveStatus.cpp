@@ -89,7 +89,10 @@ void GetFCPortStats(ProviderAgent& agent) {
   }
   TVX_LOG(TVX_DBG, "GetFCPortStats(): Update");
   throttle.start();
-  forEachFCPort(agent, [&](Adapter&, Port& port) { updateStatistics(agent, port); });
+  forEachFCPort(agent, [&](Adapter&, Port& port) {
+    updateStatistics(agent, port);
+    return true;
+  });
 }
 
 // --- Link status ---------------------------------------------------------------------------------
@@ -114,6 +117,7 @@ void UpdateFCPortStatus(ProviderAgent& agent) {
     TVXHBA_FCPort* entry =
         findContaining(agent.m_TVXHBA_FCPort_map, &TVXHBA_FCPort::DeviceID, port.m_Name);
     if (entry) setLinkState(*entry, FCPortAttributes(&adapter, port.m_Index));
+    return true;
   });
 }
 

@@ -22,18 +22,18 @@ void UpdateFCPortStatus(ProviderAgent& agent);
 void setLinkState(TVXHBA_FCPort& port, const FCPortAttributes& from);
 
 /// The ports of the FC adapters in the order of the device tree; others are skipped with a message.
-/// Throws `std::out_of_range` if the tree holds fewer adapters than it counts. `visit` gets the
-/// adapter and the port. The caller holds the data lock.
+/// `visit` gets the adapter and the port, and answers whether the walk goes on. The caller holds
+/// the data lock.
 template <class Visit>
 void forEachFCPort(ProviderAgent& agent, Visit visit) {
-  for (std::uint32_t i = 0; i < agent.m_pData->m_AdapterCount; i++) {
-    Adapter& adapter = *agent.m_pData->m_Adapters.at(i);
-    if (adapter.m_Type != TVX_ADAPTER_TYPE_FC) {
+  for (Adapter* adapter : agent.m_pData->m_Adapters) {
+    if (adapter->m_Type != TVX_ADAPTER_TYPE_FC) {
       TVX_LOG(TVX_DBG, "Skippping Adapter [%s] since it is not an FC Adapter",
-              adapter.getName().c_str());
+              adapter->getName().c_str());
       continue;
     }
-    for (Port* port : adapter.getPorts()) visit(adapter, *port);
+    for (Port* port : adapter->getPorts())
+      if (!visit(*adapter, *port)) return;
   }
 }
 

@@ -16,8 +16,17 @@ std::int32_t buildTransceiver(Port_Build& build);
 std::int32_t buildFlashImages(Port_Build& build);
 /// Takes the unit's data over to the software of the ports. Never a failure of the build.
 std::int32_t updateSoftwareFromFRU(Host_Build& host);
+/// The driver's parameters, of its own and of every port, and its tie to the service that sets
+/// them. Read anew at most once in five seconds, refreshes included. Never a failure of the build.
+std::int32_t buildDriverParameters(Host_Build& host);
 /// The virtual ports and their pools. Never a failure of the build.
 std::int32_t buildVirtualPorts(Host_Build& host);
+
+/// Step of the SAN build for one port and one remote port behind it, given as device ids: the units
+/// that are marked for optimized access, and what their list tells of the port's chip, which may be
+/// null. Failures are logged and leave units out.
+void readOptimizedAccess(ProviderAgent& agent, const std::string& port, const std::string& target,
+                         TVXHBA_Chip* chip);
 
 /// Empties the maps of the virtual ports. Always 0.
 std::int32_t ClearPortVirtualizationMaps(Agent_Maps& maps);

@@ -1,6 +1,7 @@
 // The pass over the remote ports behind every port, after the logical units are built: which chip
-// of which adapter stands in front of each of them.
+// of which adapter stands in front of each of them, and which units have optimized access.
 #include "agent/Map_Insert.h"
+#include "agent/ProductSteps.h"
 #include "agent/SanBuild.h"
 
 namespace cimrt {
@@ -55,7 +56,10 @@ Port_Target findPortTarget(ProviderAgent& agent, const std::string& entry) {
 
 std::int32_t visitPortTargets(San_Build& build) {
   if (build.portTargets.empty()) TVX_LOG(TVX_WARN, "No entries in the set");
-  for (const std::string& entry : build.portTargets) findPortTarget(build.agent, entry);
+  for (const std::string& entry : build.portTargets) {
+    const Port_Target found = findPortTarget(build.agent, entry);
+    readOptimizedAccess(build.agent, found.port, found.target, found.chip);
+  }
   build.portTargets.clear();
   return 0;
 }

@@ -349,14 +349,5 @@ TEST_F(Live_Status, PortThatCannotBeReadLeavesAllAsItWasAndTheAnswerEmpty) {
   EXPECT_EQ(numbersOf(next.at<TVXHBA_FCPort>(2)->OperationalStatus), std::vector<std::uint16_t>{2});
 }
 
-TEST_F(Live_Status, TreeThatHoldsFewerAdaptersThanItCountsEndsTheRun) {
-  ProviderAgent& agent = three();
-  agent.m_pData->m_AdapterCount = 4;
-  Delivered got;
-  readStatistics(agent, got);
-  EXPECT_EQ(got.size(), 0u);
-  EXPECT_EQ(log.level(ACTIVE_EXCEPTION), TVX_CRIT);
-}
-
 }  // namespace
 }  // namespace cimrt::test
