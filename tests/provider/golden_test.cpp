@@ -139,6 +139,7 @@ TEST_P(Golden, HostIsAsCommitted) {
   tvxsim_hold_clock(1);  // the counters stand where they start
   load();
   if (GetParam().foreign) broker->addForeign(GetParam().foreign);
+  instances("TVXHBA_SCSIProtocolEndpoint");  // waits for the SAN, which adds to the chips
   const std::vector<std::string> lines = printHost();
   const std::filesystem::path file =
       std::filesystem::path(TVX_GOLDEN) / (std::string(GetParam().name) + ".txt");
