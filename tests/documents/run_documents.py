@@ -19,16 +19,16 @@ SECONDS = 120
 
 def blocks(path):
     """(line number, lines) of each console block."""
-    inside, first, lines = False, 0, []
+    inside, first, lines, indent = False, 0, [], 0
     for number, line in enumerate(open(path, encoding="utf-8"), 1):
         line = line.rstrip("\n")
         if not inside and line.strip() == "```console":
-            inside, first, lines = True, number + 1, []
+            inside, first, lines, indent = True, number + 1, [], line.index("`")
         elif inside and line.strip() == "```":
             inside = False
             yield first, lines
         elif inside:
-            lines.append(line)
+            lines.append(line[indent:])
 
 
 def commands(first, lines):
