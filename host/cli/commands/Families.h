@@ -6,5 +6,6 @@
 namespace tvx::host {
 
 void addPortCommands(CLI::App& app, const CommandChooser& choose);
+void addStatsCommands(CLI::App& app, const CommandChooser& choose);
 
 }  // namespace tvx::host

@@ -1,0 +1,70 @@
+// `tvxcim --sim stats` as a person runs it.
+#include <nlohmann/json.hpp>
+
+#include "Simulated_Program.h"
+
+namespace tvx::host {
+namespace {
+
+using StatsProgramTest = test::Simulated_Program;
+
+std::size_t occurrences(const std::string& text, const std::string& part) {
+  std::size_t count = 0;
+  for (std::size_t at = text.find(part); at != std::string::npos; at = text.find(part, at + 1)) {
+    ++count;
+  }
+  return count;
+}
+
+TEST_F(StatsProgramTest, ShowsTheCountersOfEveryPort) {
+  const test::Outcome result = run("--sim --strict stats");
+  EXPECT_EQ(result.exitCode, 0) << result.err;
+  EXPECT_EQ(lines(result.out), 5U) << result.out;
+  EXPECT_EQ(result.out.find("WWPN  "), 0U) << result.out;
+  EXPECT_EQ(result.out.find("TX/S"), std::string::npos) << "rates need two samples";
+}
+
+TEST_F(StatsProgramTest, ShowsOnePortByItsName) {
+  const test::Outcome result = run("--sim stats 10:00:02:54:56:0c:41:10");
+  EXPECT_EQ(lines(result.out), 2U) << result.out << result.err;
+  EXPECT_NE(result.out.find("10:00:02:54:56:0C:41:10"), std::string::npos) << result.out;
+  const test::Outcome unknown = run("--sim stats 1000000000000000");
+  EXPECT_EQ(unknown.exitCode, 6);
+  EXPECT_NE(unknown.err.find("there is no port '1000000000000000'"), std::string::npos);
+}
+
+TEST_F(StatsProgramTest, PrintsJson) {
+  const test::Outcome result = run("--sim --json stats");
+  const auto json = nlohmann::json::parse(result.out);
+  EXPECT_EQ(json["version"], 1);
+  EXPECT_EQ(json["command"], "stats");
+  ASSERT_EQ(json["ports"].size(), 4U);
+  EXPECT_GE(json["ports"][0]["counters"]["PacketsTransmitted"], 9602720);
+  EXPECT_EQ(json["ports"][0]["time"].get<std::string>().size(), 25U);
+}
+
+TEST_F(StatsProgramTest, WatchesSoManySamples) {
+  const test::Outcome result = run("--sim --strict stats --watch 0.1 --count 3");
+  EXPECT_EQ(result.exitCode, 0) << result.err;
+  EXPECT_EQ(occurrences(result.out, "TX FRAMES/S"), 3U) << result.out;
+  EXPECT_EQ(lines(result.out), 15U) << result.out;
+}
+
+TEST_F(StatsProgramTest, WatchingEndsWithASignalAndUnloadsTheLibrary) {
+  const test::Outcome result = test::runShell(
+      "env -u TVX_ROOT -u TVX_SIM_STATE -u TVX_SIM_SCENARIO TMPDIR=" + m_Temporary.string() +
+      " timeout --preserve-status -s INT 1 " TVXCIM " --sim --strict stats --watch 60");
+  EXPECT_EQ(result.exitCode, 0) << result.err;
+  EXPECT_EQ(occurrences(result.out, "TX FRAMES/S"), 1U) << result.out;
+}
+
+TEST_F(StatsProgramTest, RefusesWordsThatMakeNoSense) {
+  for (const char* words :
+       {"--sim stats --watch 0", "--sim stats --watch soon", "--sim stats --count 2",
+        "--sim stats --watch 1 --count 0", "--sim stats one two"}) {
+    EXPECT_EQ(run(words).exitCode, 2) << words;
+  }
+}
+
+}  // namespace
+}  // namespace tvx::host
