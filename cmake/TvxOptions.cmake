@@ -7,10 +7,13 @@ if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_FLAGS_DEBUG MATCHES "-fsan
   # GCC's own documentation: with a sanitizer this one warns falsely (here inside <regex>). The plain builds keep it.
   target_compile_options(tvx_warnings INTERFACE -Wno-maybe-uninitialized)
 endif()
-# Paths in log lines and assertions are relative to the source tree, never those of the build machine.
-target_compile_options(tvx_warnings INTERFACE
-  "-ffile-prefix-map=${CMAKE_SOURCE_DIR}/src/=" "-ffile-prefix-map=${CMAKE_SOURCE_DIR}/="
-  "-ffile-prefix-map=${CMAKE_BINARY_DIR}/=")
+# Paths in log lines and assertions are relative to the source tree, never those of the build machine. Coverage needs the
+# true ones to find the sources.
+if(NOT CMAKE_CXX_FLAGS_DEBUG MATCHES "--coverage")
+  target_compile_options(tvx_warnings INTERFACE
+    "-ffile-prefix-map=${CMAKE_SOURCE_DIR}/src/=" "-ffile-prefix-map=${CMAKE_SOURCE_DIR}/="
+    "-ffile-prefix-map=${CMAKE_BINARY_DIR}/=")
+endif()
 
 # Everything below src/ is included as "folder/File.h"; generated headers as "generated/File.h".
 add_library(tvx_includes INTERFACE)

@@ -37,6 +37,7 @@ struct Choice {
 /// Everything the threads share.
 struct Trial {
   Trial(const Choice& what, const host::ClassCatalogue& all) : choice(what), classes(all) {
+    if (tvxsim_load(TVX_MATRIX_SCENARIO) != 0) throw std::runtime_error(tvxsim_last_error());
     host::BrokerOptions options;
     options.strict = choice.strict;
     options.classes = &classes;
