@@ -5,6 +5,9 @@
 #include <vector>
 
 #include "Agent_Fixture.h"
+#include "agent/LiveStatus.h"
+#include "services/TVX_DriverParams.h"
+#include "tvxsim/tvxsim.h"
 
 namespace cimrt::test {
 namespace {
@@ -53,6 +56,46 @@ TEST_F(Concurrency, ReadersOfAllFormsDuringRefreshes) {
   awaitIdle(agent);
   EXPECT_EQ(mixtures, 0);
   EXPECT_GE(log.count("PERF: Building Adapter Data..."), 5u);
+}
+
+/// Four readers at once, each of whom finds the throttle open or is kept from it by another.
+template <class Read>
+void readTogether(Read read) {
+  std::vector<std::thread> readers;
+  for (int i = 0; i < 4; i++)
+    readers.emplace_back([&] {
+      for (int n = 0; n < 5; n++) read();
+    });
+  for (std::thread& reader : readers) reader.join();
+}
+
+TEST_F(Concurrency, OneOfManyReadersPassesAThrottle) {
+  ProviderAgent& agent = startAgent();
+  refresh(agent);
+  addFault(R"({"call": ["LRM_GetPortStatistics", "LRM_GetPortAttributes"], "delay_ms": 3})");
+  tvxsim_forget_calls();
+  std::atomic<int> wrong{0};
+  readTogether([&] {
+    Delivered statistics;
+    agent.enumActiveInstances(agent.m_TVXHBA_FCPortStatistics_map, statistics.handler(),
+                              GetFCPortStats);
+    Delivered ports;
+    agent.enumActiveInstances(agent.m_TVXHBA_FCPort_map, ports.handler(), UpdateFCPortStatus);
+    Delivered parameters;
+    agent.enumActiveInstances(agent.m_TVXHBA_DriverParams_map, parameters.handler(),
+                              updateLocalDriverParams);
+    Delivered globals;
+    agent.enumActiveInstances(agent.m_TVXHBA_DriverParamGlobal_map, globals.handler(),
+                              updateGlobalDriverParams);
+    if (statistics.size() != 2 || ports.size() != 2 || parameters.size() == 0) wrong++;
+  });
+  EXPECT_EQ(wrong, 0);
+  for (const char* port : {"1000000000000000", "1000000000000001"}) {
+    EXPECT_EQ(tvxsim_calls("LRM_GetPortStatistics", port), 1u);
+    EXPECT_EQ(tvxsim_calls("LRM_GetPortAttributes", port), 1u);
+    EXPECT_EQ(tvxsim_calls("LRM_GetDriverParams", port), 1u);
+  }
+  EXPECT_EQ(tvxsim_calls("LRM_GetDriverParamsGlobal", nullptr), 1u);
 }
 
 TEST_F(Concurrency, SANReadersWithoutSANRefreshAllComeBack) {
