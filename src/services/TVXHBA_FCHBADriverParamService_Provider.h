@@ -8,7 +8,7 @@ namespace cimrt {
 
 class TVXHBA_FCHBADriverParamService_Provider {
  public:
-  /// Sets one parameter. `current` of its instance follows at the next refresh.
+  /// Sets one parameter. Its instance is not touched: `current` follows when it is read anew.
   /// @param bPermanent the change outlives a reboot
   /// @param bGlobal the driver's parameter, not the port's
   std::int32_t SetDriverParameter(const TVXHBA_FCHBADriverParamService* service,

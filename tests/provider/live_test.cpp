@@ -110,8 +110,7 @@ TEST_F(Live, ParameterIsSetThroughTheService) {
   EXPECT_EQ(call("SetDriverParameter", arguments("64")), 0u);
   EXPECT_EQ(call("SetDriverParameter", arguments("9999")), 40001u);
   EXPECT_EQ(call("SetDriverParameter", {{"strParam", host::Value::string("depth")}}), 32968u);
-  // The throttle of the first read is still closed: its value is the one of that read.
-  EXPECT_EQ(instances("TVXHBA_DriverParams").at(0).property("current").asUnsigned(), 30u);
+  EXPECT_EQ(tvxsim_calls("LRM_SetDriverParam", "10000000000000A1"), 2u);
   EXPECT_EQ(instances("TVXHBA_DriverParamGlobal").at(0).property("current").asUnsigned(), 3u);
 }
 
