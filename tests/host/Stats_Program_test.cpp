@@ -33,6 +33,16 @@ TEST_F(StatsProgramTest, ShowsOnePortByItsName) {
   EXPECT_NE(unknown.err.find("there is no port '1000000000000000'"), std::string::npos);
 }
 
+TEST_F(StatsProgramTest, ShowsWhatTheShippedScenarioCounts) {
+  const test::Outcome result = run("--sim live --json stats");
+  const auto json = nlohmann::json::parse(result.out);
+  ASSERT_EQ(json["ports"].size(), 3U) << result.err;
+  const auto& counters = json["ports"][0]["counters"];
+  EXPECT_EQ(counters["CRCErrors"], 0) << "the first value of its script";
+  EXPECT_EQ(counters["LinkFailures"], 2);
+  EXPECT_GE(counters["BytesTransmitted"], 4000000);
+}
+
 TEST_F(StatsProgramTest, PrintsJson) {
   const test::Outcome result = run("--sim --json stats");
   const auto json = nlohmann::json::parse(result.out);
