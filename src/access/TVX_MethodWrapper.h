@@ -6,6 +6,7 @@
 
 #include "access/TVX_Runtime_Loader.h"
 #include "common/TVX_Memory.h"
+#include "runtime/Instance.h"
 
 namespace cimrt {
 
@@ -151,6 +152,36 @@ class TVX_MethodWrapper {
   /// it; left as it was on failure
   static RM_STATUS GetOASLunList(const char* initiator, const char* port, const char* target,
                                  std::uint32_t option, TVX_Block* list);
+
+  /// Turns a URI into the path of a local file. A path or file URI whose file is there is answered
+  /// as its path; anything else is fetched with libcurl into the working directory, under the name
+  /// behind the last "/" of the URI. Certificates are not checked.
+  /// @param status set to a code when something failed, a libcurl code or 4 for a libcurl without
+  /// a function; left as it was otherwise, also when there is no libcurl: then there is no file
+  /// @param fetched set to true once a transfer was begun, also one that failed: the file at the
+  /// path is then a temporary one that the caller removes. Left as it was otherwise
+  /// @return the path of the file; the URI itself, or what its file would be called, on failure
+  static String downloadFileUsingCurl(const String& URI, Property<std::uint32_t>& status,
+                                      bool& fetched);
+  /// Sends a local file to a URI with libcurl, without checking certificates.
+  /// @return 0; 1 if the file can't be opened; -1 for any other failure
+  static int uploadFileUsingCurl(const String& URI, const char* localPath);
+
+  /// Has the library import, verify and flash a firmware file. Minutes may pass.
+  /// @return 0, 247 when the firmware waits for a reboot, another status of the library, or 1 for a
+  /// port that is not local or a file that is not there
+  static RM_STATUS tvxcimDownloadFW(const HBA_WWN* wwpn, const char* path);
+  /// Reads the version of the firmware on flash again and puts it into `FirmwareOnFlash` of the
+  /// port's software identity, if the agent has one. The caller holds the agent's data lock.
+  static RM_STATUS UpdateFirmwareOnFlash(const HBA_WWN* wwpn);
+  /// Resets the adapter of a port.
+  static RM_STATUS tvxcimReset(const HBA_WWN* wwpn);
+  /// Switches forward error correction of a port.
+  static RM_STATUS SetFECState(const char* deviceId, bool enable);
+  /// Enables or disables a port.
+  /// @param configStatus what the library says to it, 5 when a reset is needed; left as it was on
+  /// failure
+  static RM_STATUS SetPortEnabled(const char* deviceId, bool enable, std::uint8_t* configStatus);
 
   /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
   /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without

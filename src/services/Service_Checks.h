@@ -23,6 +23,9 @@ class Service_Call {
   Service_Call();
   ProviderAgent& agent;
 
+  /// Gives the data lock back early; nothing of the maps may be touched after that.
+  void release() { m_Lock.release(); }
+
  private:
   Ranked_Lock m_Lock;
 };
