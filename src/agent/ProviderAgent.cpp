@@ -167,6 +167,7 @@ void ProviderAgent::stopRefreshThread() {
     Ranked_Lock thread(m_ThreadMutex);
     m_bLoaded = false;
   }
+  if (m_pData) m_pData->stopScan();
   // No reader is left that could start another one. The thread takes m_ThreadMutex at its end, so
   // it is joined without it.
   joinRefreshThread();

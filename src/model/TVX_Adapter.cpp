@@ -77,6 +77,7 @@ Port* FCAdapter::getPort(int index) {
 void FCAdapter::rescanTargets() {
   TVX_LOG(TVX_DBG, "FCAdapter::rescanTargets");
   for (Port* port : m_Ports) {
+    if (isScanStopped()) return;
     try {
       port->rescanTargets(this);
     } catch (...) {

@@ -110,6 +110,7 @@ void Data::buildAdapter(std::uint32_t index) {
 }
 
 void Data::keepAdapter(Adapter* adapter) {
+  adapter->m_pScanStopped = &m_bScanStopped;
   m_Adapters.push_back(adapter);
   m_bFCCardFound = true;
   m_Ports.insert(m_Ports.end(), adapter->m_Ports.begin(), adapter->m_Ports.end());
@@ -118,6 +119,7 @@ void Data::keepAdapter(Adapter* adapter) {
 void Data::buildSANData() {
   TVX_LOG(TVX_DBG, "buildSANData");
   for (Adapter* adapter : m_Adapters) {
+    if (m_bScanStopped) return;
     TVX_LOG(TVX_DBG, "Target Scan from adapter: %s", adapter->getName().c_str());
     try {
       adapter->rescanTargets();

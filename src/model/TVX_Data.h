@@ -4,6 +4,7 @@
 // under the agent's data lock, and nothing may keep a pointer into it across a refresh.
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 #include <string>
 #include <vector>
@@ -32,6 +33,10 @@ class Data {
   void buildAdapterData();
   /// Rebuilds the targets of every port. A failing adapter is passed over.
   void buildSANData();
+  /// Makes a scan that is under way end before the next logical unit, with the targets found so
+  /// far, and every later one at once: many units take minutes, and an unload does not wait for
+  /// them. Any thread, with no lock held.
+  void stopScan() { m_bScanStopped = true; }
   /// Frees the adapters and goes back to the empty state.
   void freeAllData();
 
@@ -43,6 +48,8 @@ class Data {
  private:
   void buildAdapter(std::uint32_t index);
   void keepAdapter(Adapter* adapter);
+
+  std::atomic<bool> m_bScanStopped{false};
 };
 
 /// One adapter. Owns its attributes, statistics and ports.
@@ -68,6 +75,8 @@ class Adapter {
   virtual Port* getPort(int index) = 0;
   /// Rebuilds the targets of every port. A failing port is passed over.
   virtual void rescanTargets() = 0;
+  /// True once the tree's scans are to end. Any thread.
+  bool isScanStopped() const { return m_pScanStopped != nullptr && *m_pScanStopped; }
 
   AdapterAttributes* m_pAttributes = nullptr;
   AdapterStatistics* m_pStatistics = nullptr;
@@ -76,6 +85,7 @@ class Adapter {
   std::int32_t m_Number = -1;
   std::uint32_t m_FunctionType = 0;
   std::int32_t m_Type = 0;
+  const std::atomic<bool>* m_pScanStopped = nullptr;  ///< of the tree, not owned; null: no tree
 };
 
 /// An FC adapter. The constructor reads the hardware and throws `std::exception` if the adapter

@@ -105,6 +105,7 @@ void FCPort::rescanTargets(Adapter* adapter) {
 void FCPort::buildTargets(Adapter* adapter, const TVX_Block& mapping, std::uint32_t rows) {
   const std::uint8_t* const first = mapping.get() + offsetof(HBA_FCPTARGETMAPPING, entry);
   for (std::uint32_t i = 0; i < std::min(entryCount(mapping), rows); ++i) {
+    if (adapter->isScanStopped()) return;
     HBA_FCPSCSIENTRY row;
     std::memcpy(&row, first + i * sizeof row, sizeof row);
     try {

@@ -1,10 +1,11 @@
 // Many readers, refreshes and reloads at once. What each test says holds in any build; under
 // ThreadSanitizer it also shows that nothing is touched without its lock.
 #include <atomic>
+#include <chrono>
 #include <thread>
 #include <vector>
 
-#include "Agent_Fixture.h"
+#include "San_Test.h"
 #include "agent/LiveStatus.h"
 #include "services/TVX_DriverParams.h"
 #include "tvxsim/tvxsim.h"
@@ -162,6 +163,81 @@ TEST_F(Concurrency, WritersAndReadersShareTheSettings) {
   stop = true;
   reader.join();
   EXPECT_EQ(mixtures, 0);
+}
+
+// --- A SAN that takes its time -------------------------------------------------------------------
+
+using SAN_Concurrency = San_Maps;
+
+unsigned long unitsScanned() {
+  return tvxsim_calls("HBA_SendReadCapacity", nullptr);
+}
+
+void awaitScanned(unsigned long units) {
+  while (unitsScanned() < units) std::this_thread::sleep_for(std::chrono::milliseconds(1));
+}
+
+TEST_F(SAN_Concurrency, ReadersOnAStaleCacheWaitForTheNewScan) {
+  ProviderAgent& agent = buildUnits(R"({"count": 3})");
+  EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 3u);
+  agent.m_bSANRefreshSetting = false;
+  buildUnits(R"({"count": 7})");
+  ASSERT_FALSE(agent.m_bIsSANMapsReady);
+  tvxsim_forget_calls();
+  addFault(R"({"call": "HBA_SendReadCapacity", "delay_ms": 1})");
+  Delivered volumes, endpoints, paths;
+  std::thread readers[] = {
+      std::thread(
+          [&] { agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, volumes.handler()); }),
+      std::thread([&] {
+        agent.enumSANInstances(agent.m_TVXHBA_SCSIProtocolEndpoint_map, endpoints.handler());
+      }),
+      std::thread([&] {
+        agent.enumSANInstances(agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map,
+                               paths.handler());
+      })};
+  for (std::thread& reader : readers) reader.join();
+  EXPECT_EQ(volumes.size(), 7u);
+  EXPECT_EQ(endpoints.size(), 7u);
+  EXPECT_EQ(paths.size(), 7u);
+  EXPECT_EQ(unitsScanned(), 7u);  // one scan serves all of them
+  awaitIdle(agent);
+}
+
+TEST_F(SAN_Concurrency, ReadersOfAdapterClassesWaitForAScanToEnd) {
+  constexpr unsigned long UNITS = 30;
+  ProviderAgent& agent = buildUnits(R"({"count": 30})");
+  tvxsim_forget_calls();
+  addFault(R"({"call": "HBA_SendReadCapacity", "delay_ms": 2})");
+  agent.m_bSANRefreshPending = true;
+  agent.BuildCimrtInfo();
+  awaitScanned(2);
+  Delivered plain, live;
+  std::thread readers[] = {std::thread([&] {
+                             agent.enumInstances(agent.m_TVXHBA_Card_map, plain.handler());
+                             EXPECT_EQ(unitsScanned(), UNITS);
+                           }),
+                           std::thread([&] {
+                             agent.enumActiveInstances(agent.m_TVXHBA_FCPort_map, live.handler(),
+                                                       [](ProviderAgent&) {});
+                             EXPECT_EQ(unitsScanned(), UNITS);
+                           })};
+  for (std::thread& reader : readers) reader.join();
+  EXPECT_EQ(plain.size(), 1u);
+  EXPECT_EQ(live.size(), 1u);
+  awaitIdle(agent);
+}
+
+TEST_F(SAN_Concurrency, LongScanIsLeftInTheMiddleByAnUnload) {
+  useScenario(unitsBehindOnePort(R"({"count": 100000})"));
+  addFault(R"({"call": ["HBA_SendScsiInquiry", "HBA_SendReadCapacity"], "delay_ms": 1})");
+  startAgent().BuildCimrtInfo();
+  awaitScanned(5);
+  stopAgent();
+  EXPECT_LT(unitsScanned(), 10'000u);
+  EXPECT_EQ(tvxsim_open_handles(), 0u);
+  // The next life is a whole one.
+  EXPECT_EQ(build(unitsBehindOnePort(R"({"count": 2})")).m_TVXHBA_StorageVolume_map.size(), 2u);
 }
 
 }  // namespace

@@ -232,6 +232,50 @@ TEST_F(Targets, ARowWhoseAdapterDoesNotOpenIsSkipped) {
   EXPECT_EQ(port().getTarget(0)->portWWN, "5000000000000002");
 }
 
+// ---- A scan that is stopped ----
+
+TEST_F(Targets, AStoppedScanEndsBeforeTheNextUnit) {
+  for (std::uint8_t i = 1; i <= 5; ++i) addRow(i);
+  host.libraries.provide(HBA_SendReadCapacity,
+                         [this](HBA_HANDLE, HBA_WWN target, HBA_UINT64, void* response, HBA_UINT32,
+                                void* sense, HBA_UINT32) {
+                           if (target.wwn[7] == 2) data.stopScan();
+                           return command(CAPACITY, response, sense);
+                         });
+  data.buildSANData();
+  EXPECT_EQ(port().getNumberOfTargets(), 2U);
+  EXPECT_EQ(host.open, 0);
+  EXPECT_EQ(sent.size(), 8U);
+}
+
+TEST_F(Targets, AStoppedTreeIsNotScanned) {
+  addRow(1);
+  data.buildSANData();
+  data.stopScan();
+  asked.clear();
+  data.buildSANData();
+  EXPECT_TRUE(asked.empty());
+  EXPECT_EQ(port().getNumberOfTargets(), 1U);
+}
+
+TEST_F(Targets, ThePortAfterOneThatVanishedIsScanned) {
+  host.add("Torvex-A1", 2);
+  data.buildAdapterData();
+  addRow(1);
+  data.buildSANData();
+  int opens = 0;
+  host.libraries.provide(HBA_OpenAdapter, [&](char*) -> HBA_HANDLE {
+    if (++opens == 3) return 0;  // adapter 0: its port, its row; then the first port of adapter 1
+    ++host.open;
+    return 1;
+  });
+  data.buildSANData();
+  EXPECT_TRUE(capture.has(TVX_ERR, "Issue with Target Rescan - moving to the next Port"));
+  EXPECT_EQ(data.m_Ports[0]->getNumberOfTargets(), 1U);
+  EXPECT_EQ(data.m_Ports[1]->getNumberOfTargets(), 0U);
+  EXPECT_EQ(data.m_Ports[2]->getNumberOfTargets(), 1U);
+}
+
 // ---- One unit ----
 
 TEST_F(Targets, TakesTheRow) {
