@@ -50,6 +50,7 @@ class GeneratorTest(unittest.TestCase):
         self.write(GOOD)
         self.put("schema/catalogue.txt", "")
         self.put("schema/agent_maps.txt", "CIM_Thing\n")
+        self.put("schema/descriptions.txt", "")
         self.put("derived/providers.txt", "# none\n")
 
     def put(self, name, text):
@@ -182,6 +183,7 @@ class GeneratorTest(unittest.TestCase):
 
     def test_refuses_a_catalogue_row_that_differs(self):
         self.put("schema/catalogue.txt", "CIM_Thing CIM_Base I 1 6 0 1 S\n")
+        self.put("schema/descriptions.txt", "CIM_Thing A thing.\n")
         self.assertEqual(self.run_generator("--check"), (0, ""))
         self.put("schema/catalogue.txt", "CIM_Thing CIM_Base I 1 7 0 1 S\n")
         self.expect_error("catalogue.txt:1", "class 'CIM_Thing' differs from its row: described "
@@ -202,10 +204,29 @@ class GeneratorTest(unittest.TestCase):
         self.put("derived/providers.txt", "CIM_Thing san\n")
         self.expect_error("providers.txt:1", "'CIM_Thing' is not a provider class")
         self.put("schema/catalogue.txt", "CIM_Thing CIM_Base I 1 6 0 1 S\n")
+        self.put("schema/descriptions.txt", "CIM_Thing A thing.\n")
         self.put("derived/providers.txt", "CIM_Thing services/None.h\n")
         self.expect_error("providers.txt:1", "there is no header 'services/None.h'")
         self.put("derived/providers.txt", "CIM_Thing slow\n")
         self.expect_error("providers.txt:1", "expected 'san', 'interop' or a header, found 'slow'")
+
+    def test_wants_a_description_of_each_class(self):
+        self.put("schema/catalogue.txt", "CIM_Thing CIM_Base I 1 6 0 1 S\n")
+        self.expect_error("descriptions.txt", "no text for CIM_Thing")
+        self.put("schema/descriptions.txt", "# about\nCIM_Thing A thing.\nCIM_Gone Nothing.\n")
+        self.expect_error("descriptions.txt:3", "'CIM_Gone' is no class of the provider")
+        self.put("schema/descriptions.txt", "CIM_Thing A thing.\nCIM_Thing Again.\n")
+        self.expect_error("descriptions.txt:2", "'CIM_Thing' has no text, or a second one")
+
+    def test_writes_the_reference(self):
+        self.put("schema/catalogue.txt", "CIM_Thing CIM_Base I 1 6 0 1 S\n")
+        self.put("schema/descriptions.txt", "CIM_Thing A thing.\n")
+        page = self.folder / "page.md"
+        self.assertEqual(self.run_generator("--reference", page), (0, ""))
+        text = page.read_text(encoding="utf-8")
+        self.assertIn("### CIM_Thing\n\nA thing.\n\nAn instance of `CIM_Base` in `root/torvex`. Keys: `InstanceID`.", text)
+        self.assertIn("| `Depth` | sint32 |", text)
+        self.assertIn("Inherited: `InstanceID`", text)
 
     def test_touches_only_what_changes(self):
         output = self.folder / "out"

@@ -13,9 +13,9 @@ def read_descriptions(path, served):
             continue
         name, _, text = line.partition(" ")
         if name not in served:
-            raise SchemaError(f"{path.name}:{number}: '{name}' is no class of the provider")
+            raise SchemaError(f"{path.name}:{number}", f"'{name}' is no class of the provider")
         if name in texts or not text.strip():
-            raise SchemaError(f"{path.name}:{number}: '{name}' has no text, or a second one")
+            raise SchemaError(f"{path.name}:{number}", f"'{name}' has no text, or a second one")
         texts[name] = text.strip()
     return texts
 
@@ -74,7 +74,7 @@ def reference(classes, served, servings, texts):
     """The whole page."""
     missing = [name for name in served if kind(classes[name]) == "instance" and name not in texts]
     if missing:
-        raise SchemaError(f"descriptions.txt: no text for {', '.join(missing)}")
+        raise SchemaError("descriptions.txt", f"no text for {', '.join(missing)}")
     names = set(served)
     lines = ["# Class reference", "",
              "Made by `python3 src/schema/generate.py --reference docs/class-reference.md` from the class descriptions;",
