@@ -62,6 +62,10 @@ Status Broker::cleanup(const std::string& className, InterfaceKind kind, bool te
   return m_Impl->library.cleanup(className, kind, terminating);
 }
 
+Status Broker::cleanupOncePerKind(bool terminating) {
+  return m_Impl->library.cleanupOncePerKind(terminating);
+}
+
 Status Broker::unload(bool terminating) {
   Status result = m_Impl->library.cleanupAll(terminating);
   if (result.ok()) {

@@ -45,6 +45,15 @@ class LoadError : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
+/// The types in which integer keys reach a provider; keys of references alike.
+enum class KeyForm {
+  OfVersion,   ///< sint64, or for version 0 uint64 unless negative
+  Declared,    ///< the type that the class declares, or that the client wrote
+  Unsigned64,  ///< uint64, sint64 if negative
+  Signed64,    ///< sint64
+  Text,        ///< strings; booleans as well
+};
+
 struct BrokerOptions {
   /// 200 has every table; 100 has the tables of the first version and no memory table; 0 calls its
   /// tables version 1, has no memory table and no thread control, hands out keys as uint64 or
@@ -62,6 +71,12 @@ struct BrokerOptions {
   std::vector<std::string> moreNameSpaces = {"root/pg_interop"};
   /// Text of the context entry CMPIPrincipal; nothing makes a string object without text.
   std::optional<std::string> user = "root";
+  KeyForm keys = KeyForm::OfVersion;
+  /// False leaves the paths of requests without a namespace: a string object without text.
+  bool tellsNameSpace = true;
+  /// False makes attaching a thread do nothing, as some servers have it: up-calls then work on any
+  /// thread, and what such a thread makes is reclaimed with the broker.
+  bool attaches = true;
 };
 
 /// Null-terminated lists are "nothing" for "all properties".
@@ -166,6 +181,9 @@ class Broker {
   /// Calls `cleanup` of every interface. If all agree, closes the library and answers OK; else
   /// answers the first refusal and keeps the library with the interfaces that refused.
   Status unload(bool terminating = false);
+  /// What a server does that takes a library's interfaces of one kind for one: calls `cleanup` of a
+  /// single interface of each kind, whatever their number, and forgets them all. The library stays.
+  Status cleanupOncePerKind(bool terminating);
   /// True if the library stayed mapped after its last close (static thread data can keep it).
   bool stillMapped(const std::filesystem::path& library) const;
 

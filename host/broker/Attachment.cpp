@@ -20,6 +20,9 @@ CMPIContext* Core::prepareAttach(const CMPIContext* context) {
 }
 
 CMPIStatus Core::attach(const CMPIContext* context) {
+  if (!m_Options.attaches) {
+    return status(CMPI_RC_OK);
+  }
   const std::lock_guard lock(m_Mutex);
   for (const auto& attachment : m_Attachments) {
     if (attachment->context == context) {
@@ -42,7 +45,7 @@ CMPIStatus Core::detach(const CMPIContext* context) {
     ended = std::move(*found);
     m_Attachments.erase(found);
   }
-  const bool attached = popScope(ended->scope);
+  const bool attached = !m_Options.attaches || popScope(ended->scope);
   ScopeReport report = ended->scope.end();
   if (!attached) {
     report.complaints.emplace_back("detached on a thread that was not attached");

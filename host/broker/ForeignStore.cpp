@@ -35,6 +35,22 @@ Instance filtered(const Instance& instance, const PropertyList& properties) {
   return result;
 }
 
+std::ptrdiff_t referenceCount(const Instance& instance) {
+  return std::count_if(instance.properties.begin(), instance.properties.end(),
+                       [](const NamedValue& each) { return each.value.type() == CMPI_ref; });
+}
+
+/// The class that a walk goes over.
+const std::string& linkClass(const Request& request) {
+  const bool references =
+      request.operation == Operation::References || request.operation == Operation::ReferenceNames;
+  return references ? request.resultClass : request.assocClass;
+}
+
+bool fits(const std::string& filter, const std::string& name) {
+  return filter.empty() || sameName(filter, name);
+}
+
 Status failure(int rc, std::string message) {
   return Status{rc, std::move(message)};
 }
@@ -104,13 +120,28 @@ bool ForeignStore::knowsNameSpace(const std::string& nameSpace) const {
   return contains(m_NameSpaces, nameSpace);
 }
 
+bool ForeignStore::isBelow(const std::string& name, const std::string& base) const {
+  return base.empty() || sameName(name, base) ||
+         (m_Options.classes != nullptr && m_Options.classes->isA(name, base));
+}
+
 std::vector<std::string> ForeignStore::classesBelow(const std::string& base) const {
   const std::lock_guard lock(m_Mutex);
   std::vector<std::string> names;
   for (const std::string& name : m_Classes) {
-    if (sameName(name, base) ||
-        (m_Options.classes != nullptr && m_Options.classes->isA(name, base))) {
+    if (isBelow(name, base)) {
       names.push_back(name);
+    }
+  }
+  return names;
+}
+
+std::vector<std::string> ForeignStore::associationsBelow(const std::string& base) const {
+  const std::lock_guard lock(m_Mutex);
+  std::vector<std::string> names;
+  for (const Instance& instance : m_Instances) {
+    if (isBelow(instance.className(), base) && referenceCount(instance) > 1) {
+      addName(names, instance.className());
     }
   }
   return names;
@@ -215,6 +246,43 @@ Status ForeignStore::invoke(const Request& request, Reply& reply) const {
                  fmt::format("{} has no method {}", request.path.className, request.method));
 }
 
+/// False if `link` does not refer to the source of the walk, in its role.
+bool ForeignStore::farEnds(const Instance& link, const Request& request,
+                           std::vector<ObjectPath>& ends) const {
+  bool matched = false;
+  const bool references = &linkClass(request) == &request.resultClass;
+  for (const NamedValue& property : link.properties) {
+    if (property.value.type() != CMPI_ref || property.value.isNull()) {
+      continue;
+    }
+    const ObjectPath& target = property.value.asReference();
+    if (target.sameObject(request.path)) {
+      matched = matched || fits(request.role, property.name);
+    } else if (!references && isBelow(target.className, request.resultClass) &&
+               fits(request.resultRole, property.name)) {
+      ends.push_back(target);
+    }
+  }
+  return matched;
+}
+
+Status ForeignStore::walk(const Request& request, Reply& reply) const {
+  for (const Instance& link : m_Instances) {
+    std::vector<ObjectPath> ends;
+    if (!sameName(link.className(), linkClass(request)) || !farEnds(link, request, ends)) {
+      continue;
+    }
+    if (request.operation == Operation::References) {
+      reply.instances.push_back(filtered(link, request.properties));
+    } else if (request.operation == Operation::ReferenceNames) {
+      reply.paths.push_back(link.path);
+    } else {
+      std::move(ends.begin(), ends.end(), std::back_inserter(reply.paths));
+    }
+  }
+  return {};
+}
+
 Reply ForeignStore::answer(const Request& request) {
   Reply reply;
   reply.providersAsked = 1;
@@ -247,6 +315,7 @@ Reply ForeignStore::answer(const Request& request) {
       reply.status = failure(CMPI_RC_ERR_NOT_SUPPORTED, "queries are not supported");
       break;
     default:
+      reply.status = walk(request, reply);
       break;
   }
   reply.done = reply.status.ok();

@@ -37,9 +37,13 @@ class ForeignStore {
   bool knowsNameSpace(const std::string& nameSpace) const;
   /// Classes of the store that are `base` or derive from it.
   std::vector<std::string> classesBelow(const std::string& base) const;
+  /// Those of them ("" for all) that associate: an instance of theirs refers to two objects.
+  std::vector<std::string> associationsBelow(const std::string& base) const;
   std::vector<Instance> instances(const std::string& className) const;
 
-  /// Answers a request for the one class of its path. Association walks are answered empty.
+  /// Answers a request for the one class of its path. Walks go over the one class that
+  /// `assocClass` (for references `resultClass`) names; the instances that `Associators` asks for
+  /// are answered as paths, since they may be anybody's.
   Reply answer(const Request& request);
 
  private:
@@ -64,6 +68,9 @@ class ForeignStore {
   Status modify(const Request& request);
   Status remove(const Request& request);
   Status invoke(const Request& request, Reply& reply) const;
+  Status walk(const Request& request, Reply& reply) const;
+  bool isBelow(const std::string& name, const std::string& base) const;
+  bool farEnds(const Instance& link, const Request& request, std::vector<ObjectPath>& ends) const;
 
   const BrokerOptions& m_Options;
   mutable std::mutex m_Mutex;

@@ -17,7 +17,8 @@ CMPIString* getText(const CMPIObjectPath* face, const std::string ObjectPath::*m
   }
   setStatus(rc, CMPI_RC_OK);
   const std::string& text = object->contents.*member;
-  const bool absent = text.empty() && object->core().options().version == 0;
+  const BrokerOptions& options = object->core().options();
+  const bool absent = text.empty() && (options.version == 0 || !options.tellsNameSpace);
   return makeString(object->core(), absent ? std::nullopt : std::optional(text), Origin::HandedOut);
 }
 

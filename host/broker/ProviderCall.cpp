@@ -26,18 +26,20 @@ const char* filterText(const std::string& text) {
   return text.empty() ? nullptr : text.c_str();
 }
 
-Value wideKey(const Value& value, int version) {
-  if (value.isNull()) {
-    return value;
+KeyForm keyForm(const BrokerOptions& options) {
+  if (options.keys != KeyForm::OfVersion) {
+    return options.keys;
   }
-  if (value.type() == CMPI_ref) {
-    return Value::reference(withWideKeys(value.asReference(), version));
-  }
-  if (value.type() < CMPI_uint8 || value.type() > CMPI_sint64) {
-    return value;
-  }
+  return options.version == 0 ? KeyForm::Unsigned64 : KeyForm::Signed64;
+}
+
+bool isInteger(CMPIType type) {
+  return type >= CMPI_uint8 && type <= CMPI_sint64;
+}
+
+Value integerKey(const Value& value, KeyForm form) {
   const bool isSigned = value.type() >= CMPI_SINT;
-  if (version == 0 && !(isSigned && value.asSigned() < 0)) {
+  if (form == KeyForm::Unsigned64 && !(isSigned && value.asSigned() < 0)) {
     return Value::number(CMPI_uint64, value.asUnsigned());
   }
   const std::int64_t wide =
@@ -45,12 +47,27 @@ Value wideKey(const Value& value, int version) {
   return Value::signedNumber(CMPI_sint64, wide);
 }
 
+Value serversKey(const Value& value, const BrokerOptions& options) {
+  const KeyForm form = keyForm(options);
+  if (value.isNull()) {
+    return value;
+  }
+  if (value.type() == CMPI_ref) {
+    return Value::reference(withServersKeys(value.asReference(), options));
+  }
+  const bool asText = isInteger(value.type()) || value.type() == CMPI_boolean;
+  if (form == KeyForm::Text && asText) {
+    return Value::string(value.display());
+  }
+  return isInteger(value.type()) && form != KeyForm::Declared ? integerKey(value, form) : value;
+}
+
 }  // namespace
 
-ObjectPath withWideKeys(const ObjectPath& path, int version) {
+ObjectPath withServersKeys(const ObjectPath& path, const BrokerOptions& options) {
   ObjectPath result = path;
   for (NamedValue& key : result.keys.items()) {
-    key.value = wideKey(key.value, version);
+    key.value = serversKey(key.value, options);
   }
   return result;
 }
@@ -63,8 +80,11 @@ void ProviderCall::makeObjects() {
   m_Context = makeContext(m_Core, contextEntries(m_Core.options(), m_Request.path.nameSpace),
                           Origin::HandedOut);
   m_Result = makeResult(m_Core, m_Reply);
-  m_Path =
-      makePath(m_Core, withWideKeys(m_Request.path, m_Core.options().version), Origin::HandedOut);
+  ObjectPath path = withServersKeys(m_Request.path, m_Core.options());
+  if (!m_Core.options().tellsNameSpace) {
+    path.nameSpace.clear();
+  }
+  m_Path = makePath(m_Core, std::move(path), Origin::HandedOut);
   if (m_Request.properties) {
     for (const std::string& name : *m_Request.properties) {
       m_Names.push_back(name.c_str());

@@ -32,8 +32,7 @@ class ProviderCall {
   const char** m_Properties = nullptr;  ///< into m_Names, or null for all
 };
 
-/// Integer keys in the widths that servers hand out: sint64, or for version 0 uint64 unless
-/// negative. References in keys likewise.
-ObjectPath withWideKeys(const ObjectPath& path, int version);
+/// The path with its keys in the form that the options tell. References in keys likewise.
+ObjectPath withServersKeys(const ObjectPath& path, const BrokerOptions& options);
 
 }  // namespace tvx::host

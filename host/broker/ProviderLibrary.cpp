@@ -185,6 +185,25 @@ Status ProviderLibrary::cleanupAll(bool terminating) {
   return first;
 }
 
+Status ProviderLibrary::cleanupOncePerKind(bool terminating) {
+  const std::lock_guard lock(m_Mutex);
+  Status first;
+  for (const InterfaceKind kind :
+       {InterfaceKind::Instance, InterfaceKind::Association, InterfaceKind::Method}) {
+    const auto one = std::find_if(m_Known.begin(), m_Known.end(),
+                                  [&](const auto& entry) { return entry.second.kind == kind; });
+    if (one == m_Known.end()) {
+      continue;
+    }
+    Status result = cleanupOne(one->second, terminating);
+    if (first.ok()) {
+      first = std::move(result);
+    }
+  }
+  m_Known.clear();
+  return first;
+}
+
 void ProviderLibrary::close() {
   if (m_Handle != nullptr) {
     dlclose(m_Handle);

@@ -33,6 +33,8 @@ class ProviderLibrary {
   void* interface(const std::string& className, InterfaceKind kind);
   Status cleanup(const std::string& className, InterfaceKind kind, bool terminating);
   Status cleanupAll(bool terminating);
+  /// One `cleanup` for all interfaces of a kind; the first refusal is answered.
+  Status cleanupOncePerKind(bool terminating);
   void close();
 
  private:

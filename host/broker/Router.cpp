@@ -119,10 +119,31 @@ std::vector<std::string> Broker::Impl::associationsBelow(const std::string& base
       names.push_back(name);
     }
   }
+  for (const std::string& name : store.associationsBelow(base)) {
+    if (!library.hasFactory(name, InterfaceKind::Association)) {
+      names.push_back(name);
+    }
+  }
   if (names.empty() && !base.empty()) {
     names.push_back(base);
   }
   return names;
+}
+
+Reply Broker::Impl::foreignWalk(const Request& request) {
+  Reply reply = store.answer(request);
+  if (request.operation != Operation::Associators) {
+    return reply;
+  }
+  Request get;
+  get.operation = Operation::GetInstance;
+  get.properties = request.properties;
+  for (const ObjectPath& path : std::exchange(reply.paths, {})) {
+    get.path = path;
+    Reply one = upCall(get);
+    append(reply.instances, one.instances);
+  }
+  return reply;
 }
 
 Reply Broker::Impl::run(const Request& request) {
@@ -158,7 +179,9 @@ Reply Broker::Impl::runWalk(const Request& request) {
     (request.operation == Operation::Associators || request.operation == Operation::AssociatorNames
          ? each.assocClass
          : each.resultClass) = name;
-    merge(total, call(name, each));
+    const bool foreign =
+        !library.hasFactory(name, InterfaceKind::Association) && store.knowsClass(name);
+    merge(total, foreign ? foreignWalk(each) : call(name, each));
   }
   return total;
 }

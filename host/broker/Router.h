@@ -30,6 +30,8 @@ class Broker::Impl : public UpCallTarget {
   bool knowsClass(const std::string& className) const;
   Reply runInstances(const Request& request);
   Reply runWalk(const Request& request);
+  /// A walk over one class of foreign associations, whose far ends may be anybody's.
+  Reply foreignWalk(const Request& request);
   std::vector<std::string> classesBelow(const std::string& base) const;
   std::vector<std::string> associationsBelow(const std::string& base) const;
   Reply one(const std::string& className, const Request& request);

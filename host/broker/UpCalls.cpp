@@ -33,7 +33,7 @@ class UpCall {
       return;
     }
     m_Request.path = object->contents;
-    if (currentScope(m_Core) == nullptr) {
+    if (currentScope(m_Core) == nullptr && m_Core.options().attaches) {
       m_Core.noteLate(std::string(operationName(operation)) +
                       " was called on a thread that is not attached");
       m_Rc = m_Core.options().version == 0 ? CMPI_RC_OK : CMPI_RC_ERR_FAILED;

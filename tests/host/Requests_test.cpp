@@ -205,6 +205,12 @@ TEST(RequestTest, IndicationsAreCollected) {
   EXPECT_EQ(broker.indications()[0].instance.property("Number").asUnsigned(), 2U);
 }
 
+BrokerOptions optionsOf(int version) {
+  BrokerOptions options;
+  options.version = version;
+  return options;
+}
+
 TEST(WideKeysTest, IntegerKeysTakeTheWidthThatServersHandOut) {
   ObjectPath inner{"", "", "X", {{"N", Value::number(CMPI_uint16, 7)}}};
   const ObjectPath path{"",
@@ -215,13 +221,13 @@ TEST(WideKeysTest, IntegerKeysTakeTheWidthThatServersHandOut) {
                          {"C", Value::string("c")},
                          {"D", Value::reference(inner)},
                          {"E", Value::boolean(true)}}};
-  const ObjectPath usual = withWideKeys(path, 200);
+  const ObjectPath usual = withServersKeys(path, BrokerOptions{});
   EXPECT_EQ(usual.key("A"), Value::signedNumber(CMPI_sint64, 7));
   EXPECT_EQ(usual.key("B"), Value::signedNumber(CMPI_sint64, -7));
   EXPECT_EQ(usual.key("C"), Value::string("c"));
   EXPECT_EQ(usual.key("D").asReference().key("N"), Value::signedNumber(CMPI_sint64, 7));
   EXPECT_EQ(usual.key("E"), Value::boolean(true));
-  const ObjectPath zero = withWideKeys(path, 0);
+  const ObjectPath zero = withServersKeys(path, optionsOf(0));
   EXPECT_EQ(zero.key("A"), Value::number(CMPI_uint64, 7));
   EXPECT_EQ(zero.key("B"), Value::signedNumber(CMPI_sint64, -7));
 }
