@@ -1,5 +1,4 @@
-// What happens while the library is being loaded.
-#include "rmapi/snia_hba.h"
+// What happens while one of the simulated libraries is being loaded: each has a copy of its own.
 #include "state/Simulation.h"
 #include "state/Symbols.h"
 
