@@ -14,6 +14,7 @@
 #include "common/TVX_Common.h"
 #include "common/TVX_File.h"
 #include "common/TVX_Path.h"
+#include "common/TVX_Replace_File.h"
 #include "runtime/Buffer.h"
 #include "runtime/Safe_Open.h"
 
@@ -236,15 +237,13 @@ void CLogger::loadConfig() {
   setMode(settings.mode);
 }
 
-void CLogger::writeDump() {
-  const TVX_File stream(
-      open_for_writing(tvxPath(dumpPath().c_str()).c_str(), "w", LOG_PERMISSIONS));
-  if (stream == nullptr) {
-    TVX_LOG(TVX_ERR, "Unable to open dump file\n");
-    return;
-  }
-  std::fprintf(stream.get(), "%d,%d,%d\n", mode(), level(), isEnabled() ? 1 : 0);
-  std::fputs(logFilePath().c_str(), stream.get());
+bool CLogger::writeDump() {
+  Buffer text;
+  text.format("%d,%d,%d\n%s", mode(), level(), isEnabled() ? 1 : 0, logFilePath().c_str());
+  const Replace_Result result =
+      tvxReplaceFile(tvxPath(dumpPath().c_str()), text.c_str(), LOG_PERMISSIONS);
+  if (result == Replace_Result::NOT_OPENED) TVX_LOG(TVX_ERR, "Unable to open dump file\n");
+  return result == Replace_Result::WRITTEN;
 }
 
 }  // namespace cimrt

@@ -54,8 +54,9 @@ class CLogger {
 
   /// Reads the dump file and applies it; see `isDumpAccessible` for a file that is not there.
   void loadConfig();
-  /// Writes mode, level, enabled and the log file's path to the dump file.
-  void writeDump();
+  /// Writes mode, level, enabled and the log file's path to the dump file. False if it can't be
+  /// written; then an earlier one stands as it was.
+  bool writeDump();
   /// True if the dump file can be read; logs the reason at `TVX_CRIT` if not.
   bool isDumpAccessible();
   /// The dump file without the TVX_ROOT prefix. Settled by the first need.

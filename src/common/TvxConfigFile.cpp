@@ -13,6 +13,9 @@
 #include "common/CLogger.h"
 #include "common/TVX_File.h"
 #include "common/TVX_Path.h"
+#include "common/TVX_Replace_File.h"
+#include "runtime/Buffer.h"
+#include "runtime/Safe_Open.h"
 
 namespace cimrt {
 
@@ -115,13 +118,12 @@ void TvxConfigFile::takeLine(std::string_view text, Keys_Set& set) {
 
 void TvxConfigFile::write() {
   if (m_Path.empty()) return;
-  const TVX_File stream = tvxOpenFile(m_Path.c_str(), "w");
-  if (stream == nullptr) return;
-  std::FILE* const out = stream.get();
-  std::fprintf(out, "%s\n# Torvex HBA CIM Provider Configuration Settings #\n%s\n", RULER, RULER);
-  std::fprintf(out, "%s = %d\n", KEY_CACHE_TIMEOUT.data(), static_cast<int>(getCacheTimeout()));
-  std::fprintf(out, "%s = %s\n", KEY_ADAPTER.data(), truthText(getAdapterRefresh()));
-  std::fprintf(out, "%s = %s\n", KEY_SAN.data(), truthText(getSANRefresh()));
+  Buffer text;
+  text.format("%s\n# Torvex HBA CIM Provider Configuration Settings #\n%s\n", RULER, RULER);
+  text.format("%s = %d\n", KEY_CACHE_TIMEOUT.data(), static_cast<int>(getCacheTimeout()));
+  text.format("%s = %s\n", KEY_ADAPTER.data(), truthText(getAdapterRefresh()));
+  text.format("%s = %s\n", KEY_SAN.data(), truthText(getSANRefresh()));
+  tvxReplaceFile(m_Path, text.c_str(), SETTINGS_PERMISSIONS);
 }
 
 // ---- Access to the values ----

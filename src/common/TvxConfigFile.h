@@ -18,8 +18,9 @@ inline constexpr const char* TVX_WEBLAUNCH_PATH = "/etc/tvx_smis.conf";
 /// Setters and getters may be called from any thread.
 class TvxConfigFile {
  public:
-  TvxConfigFile();   ///< the defaults; reads nothing
-  ~TvxConfigFile();  ///< rewrites the file of `load` in full; a failure is silent
+  TvxConfigFile();  ///< the defaults; reads nothing
+  /// Rewrites the file of `load` in full. A failure is silent and leaves the file as it was.
+  ~TvxConfigFile();
   TvxConfigFile(const TvxConfigFile&) = delete;
   TvxConfigFile& operator=(const TvxConfigFile&) = delete;
 
