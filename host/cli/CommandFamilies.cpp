@@ -12,6 +12,8 @@ using AddCommands = void (*)(CLI::App& app, const CommandChooser& choose);
 constexpr AddCommands families[] = {
     addPortCommands,
     addStatsCommands,
+    addLogCommands,
+    addSettingsCommands,
 };
 
 }  // namespace

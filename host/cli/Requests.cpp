@@ -96,7 +96,9 @@ std::uint64_t resultNumber(const Reply& reply) {
 void printJson(Session& session, const char* member, nlohmann::ordered_json content) {
   nlohmann::ordered_json json = jsonHead(session.options().command);
   json[member] = std::move(content);
-  session.out() << json.dump(2) << "\n";
+  // What the hardware and the system log say may be no UTF-8.
+  session.out() << json.dump(2, ' ', false, nlohmann::ordered_json::error_handler_t::replace)
+                << "\n";
 }
 
 }  // namespace tvx::host

@@ -115,6 +115,7 @@ constexpr Build_Step<Host_Build> CARD_STEPS[] = {
     startServices,
     buildAdapters,
     buildDriverParameters,
+    buildDriverLog,
     buildVirtualPorts,
 };
 // clang-format on

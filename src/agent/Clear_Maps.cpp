@@ -49,6 +49,14 @@ constexpr Clear_Map DUMP_AND_TAGGING[] = {
     clearMap<&Agent_Maps::m_TVXHBA_FCTagElementSoftwareIdentity_map>,
 };
 
+/// The driver's log. The log itself stands beside the provider's, in maps emptied further below.
+constexpr Clear_Map DRIVER_LOG[] = {
+    clearMap<&Agent_Maps::m_TVXHBA_RecordLog_driver_map>,
+    clearMap<&Agent_Maps::m_TVXHBA_EnabledRecordLogCapabilities_driver_map>,
+    clearMap<&Agent_Maps::m_TVXHBA_ProviderUseOfLog_driver_map>,
+    clearMap<&Agent_Maps::m_TVXHBA_FCDriverLogEntry_map>,
+};
+
 /// Cards and what is on them.
 constexpr Clear_Map PHYSICAL[] = {
     clearMap<&Agent_Maps::m_TVXHBA_Card_map>,
@@ -69,7 +77,7 @@ constexpr Clear_Map PHYSICAL[] = {
     clearMap<&Agent_Maps::m_TVXHBA_FRUElementVPD_map>,
 };
 
-/// The provider's record log, and the initiator endpoints.
+/// The record logs, and the initiator endpoints.
 constexpr Clear_Map RECORD_LOG[] = {
     clearMap<&Agent_Maps::m_TVXHBA_RecordLog_map>,
     clearMap<&Agent_Maps::m_TVXHBA_EnabledRecordLogCapabilities_map>,
@@ -172,6 +180,7 @@ void ProviderAgent::clearAdapterMaps() {
   TVX_LOG(TVX_DBG, "PERF: Entered clearAdapterMaps()");
   clearGroup(*this, CORE);
   clearGroup(*this, DUMP_AND_TAGGING);
+  clearGroup(*this, DRIVER_LOG);
   ClearPortVirtualizationMaps(*this);
   clearGroup(*this, PHYSICAL);
   TVX_LOG(TVX_DBG, "Clearing Record Log maps");

@@ -1,5 +1,6 @@
-// Steps of the adapter maps that the folder of the services implements: product data, transceivers,
-// flash contents, virtual ports. They are declared here because the agent's tables name them.
+// Steps of the adapter maps that the folders of the services and the logs implement: product data,
+// transceivers, flash contents, driver log, virtual ports. They are declared here because the
+// agent's tables name them.
 #pragma once
 
 #include "agent/MapBuild.h"
@@ -19,6 +20,8 @@ std::int32_t updateSoftwareFromFRU(Host_Build& host);
 /// The driver's parameters, of its own and of every port, and its tie to the service that sets
 /// them. Read anew at most once in five seconds, refreshes included. Never a failure of the build.
 std::int32_t buildDriverParameters(Host_Build& host);
+/// The driver's record log, for the first FC adapter. Never a failure of the build.
+std::int32_t buildDriverLog(Host_Build& host);
 /// The virtual ports and their pools. Never a failure of the build.
 std::int32_t buildVirtualPorts(Host_Build& host);
 

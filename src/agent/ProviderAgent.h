@@ -25,6 +25,7 @@
 #include <memory>
 #include <string>
 
+#include "agent/Device_Log_Buffer.h"
 #include "agent/Ranked_Mutex.h"
 #include "common/CLogger.h"
 #include "common/TvxConfigFile.h"
@@ -45,6 +46,9 @@ inline constexpr int PROVIDER_MAJOR = 10;
 inline constexpr int PROVIDER_MINOR = 2;
 inline constexpr int PROVIDER_REVISION = 107;
 inline constexpr int PROVIDER_BUILD = 7;
+
+/// The system log, without the TVX_ROOT prefix.
+inline constexpr const char* SYSTEM_LOG_PATH = "/var/log/messages";
 
 /// Result of a failed map builder; 0 is success.
 inline constexpr std::int32_t MAP_BUILD_FAILED = 0x8001;
@@ -120,6 +124,11 @@ class ProviderAgent : public Agent_Maps {
   /// Empties the SAN maps. The caller holds `m_SANMapsReadyMutex`.
   void clearSANMaps();
 
+  /// Adds what the driver wrote to the system log to `m_DeviceLogBuffer`, newest line first, as far
+  /// as there is room. A system log that can't be read has no lines. The caller holds `m_DataMutex`
+  /// and has emptied the buffer.
+  void readDriverLog();
+
   // --- Refresh control. Read and written from any thread; the settings come from m_ConfigFile.
   std::atomic<bool> m_bAdapterRefreshPending{true};   ///< an adapter rebuild is owed
   std::atomic<bool> m_bAdapterRefreshSetting{false};  ///< rebuild the adapters on every run
@@ -137,6 +146,9 @@ class ProviderAgent : public Agent_Maps {
   Ranked_Mutex m_DataMutex{Lock_Rank::DATA};
   std::unique_ptr<Data> m_pData;                        ///< null until loaded
   std::unique_ptr<TVX_MethodWrapper> m_pMethodWrapper;  ///< null until loaded
+
+  // --- Lines of the driver log, newest first. Guarded by m_DataMutex; no refresh empties it.
+  Device_Log_Buffer m_DeviceLogBuffer;
 
   // --- Readiness. Written by the refresh thread alone, tested under the mutex of the group.
   Ranked_Mutex m_AdapterDataReadyMutex{Lock_Rank::ADAPTER_DATA};

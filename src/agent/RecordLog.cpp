@@ -1,7 +1,9 @@
-// The provider's own record log: the log, what can be done with it, and who writes it.
+// The names of the record logs, and the provider's own: the log, what can be done with it, and who
+// writes it.
 #include "agent/Associations.h"
 #include "agent/MapSteps.h"
 #include "agent/Map_Insert.h"
+#include "agent/RecordLogs.h"
 #include "agent/RegisteredProfiles.h"
 #include "agent/SoftwareIdentities.h"
 
@@ -16,13 +18,20 @@ struct Log_Build {
   TVXHBA_EnabledRecordLogCapabilities* capabilities = nullptr;
 };
 
+/// `Name` of the first computer system; empty while there is none.
+const char* systemName(ProviderAgent& agent) {
+  auto& systems = agent.m_CIM_ComputerSystem_map;
+  if (systems.size() == 0 || systems[0]->Name.is_null()) return "";
+  return systems[0]->Name.value.c_str();
+}
+
 /// States by whether anything is logged at all.
 void setLogState(TVXHBA_RecordLog& log, bool enabled) {
-  log.RequestedState.set(enabled ? 2 : 5);
-  log.EnabledState.set(enabled ? 2 : 3);
+  log.RequestedState.set(enabled ? LOG_ENABLED : LOG_NO_CHANGE);
+  log.EnabledState.set(enabled ? LOG_ENABLED : LOG_DISABLED);
   log.LogState.set(4);
   log.OverwritePolicy.set(2);
-  log.OperationalStatus.set({2});
+  log.OperationalStatus.set({LOG_OK});
   log.HealthState.set(5);
 }
 
@@ -30,7 +39,7 @@ Ref<TVXHBA_RecordLog> describeLog(const Host_Build& host) {
   constexpr const char* NAME = "Record logs for Torvex CIM Provider";
   const CLogger& logger = getLogger();
   Ref<TVXHBA_RecordLog> log = makeInstance<TVXHBA_RecordLog>();
-  log->InstanceID.set(formatText("TVXHBA:ProviderLog:%s", host.system->Name.value.c_str()).c_str());
+  log->InstanceID.set(providerLogInstanceID(host.agent).c_str());
   log->MaxNumberOfRecords.set(TVX_CIMLogger::DEFAULT_CAPACITY);
   log->CurrentNumberOfRecords.set(0);
   setLogState(*log.get(), logger.isEnabled());
@@ -78,7 +87,7 @@ std::int32_t buildCapabilities(Log_Build& build) {
       insertInto(agent.m_TVXHBA_EnabledRecordLogCapabilities_map, std::move(made),
                  "Insert Failed : m_TVXHBA_TVXHBA_EnabledRecordLogCapabilities_map");
   createAssociation(agent, Association_Kind::RECORD_LOG_CAPABILITIES,
-                    formatText("%s : Logging capabilities", build.log->ElementName.value.c_str()),
+                    formatText("%s : Logging capabilities", build.log->InstanceID.value.c_str()),
                     build.log, build.capabilities);
   return 0;
 }
@@ -107,6 +116,18 @@ constexpr Build_Step<Log_Build> LOG_STEPS[] = {
 };
 
 }  // namespace
+
+std::string providerLogInstanceID(ProviderAgent& agent) {
+  return formatText("TVXHBA:ProviderLog:%s", systemName(agent));
+}
+
+std::string driverLogInstanceID(ProviderAgent& agent) {
+  return formatText("TVX: FC Driver Record Log:%s", systemName(agent));
+}
+
+TVXHBA_RecordLog* findRecordLog(ProviderAgent& agent, const std::string& instanceID) {
+  return findByText(agent.m_TVXHBA_RecordLog_map, &TVXHBA_RecordLog::InstanceID, instanceID);
+}
 
 std::int32_t buildRecordLog(Host_Build& host) {
   Log_Build build{host};

@@ -3,16 +3,23 @@
 #include <vector>
 
 #include "Map_Test.h"
+#include "agent/RecordLogs.h"
 
 namespace cimrt::test {
 namespace {
 
-using Record_Log = Adapter_Maps;
+class Record_Log : public Adapter_Maps {
+ protected:
+  /// The provider's own log; the driver's stands beside it.
+  static const TVXHBA_RecordLog* providerLog(ProviderAgent& agent) {
+    return findRecordLog(agent, providerLogInstanceID(agent));
+  }
+};
 
 TEST_F(Record_Log, DescribesTheLogger) {
   ProviderAgent& agent = build();
-  ASSERT_EQ(agent.m_TVXHBA_RecordLog_map.size(), 1u);
-  const TVXHBA_RecordLog& record = *agent.m_TVXHBA_RecordLog_map[0];
+  ASSERT_EQ(agent.m_TVXHBA_RecordLog_map.size(), 2u);
+  const TVXHBA_RecordLog& record = *providerLog(agent);
   EXPECT_EQ(text(record.InstanceID), "TVXHBA:ProviderLog:" + agent.m_HostName);
   EXPECT_EQ(record.MaxNumberOfRecords.value, 1024u);
   EXPECT_EQ(record.CurrentNumberOfRecords.value, 0u);
@@ -37,7 +44,7 @@ TEST_F(Record_Log, OfADisabledLoggerIsDisabledAndHasNoPath) {
   getLogger().disable();
   refresh(agent);
   getLogger().enable();
-  const TVXHBA_RecordLog& record = *agent.m_TVXHBA_RecordLog_map[0];
+  const TVXHBA_RecordLog& record = *providerLog(agent);
   EXPECT_EQ(record.RequestedState.value, 5);
   EXPECT_EQ(record.EnabledState.value, 3);
   EXPECT_EQ(record.LogMode.value, TVX_LOG_MODE_MEMORY);
@@ -47,17 +54,18 @@ TEST_F(Record_Log, OfADisabledLoggerIsDisabledAndHasNoPath) {
 
 TEST_F(Record_Log, HasCapabilitiesAndIsUsedByTheProvider) {
   ProviderAgent& agent = build();
-  const TVXHBA_RecordLog* record = agent.m_TVXHBA_RecordLog_map[0];
-  ASSERT_EQ(agent.m_TVXHBA_EnabledRecordLogCapabilities_map.size(), 1u);
-  const auto& capabilities = *agent.m_TVXHBA_EnabledRecordLogCapabilities_map[0];
+  const TVXHBA_RecordLog* record = providerLog(agent);
+  ASSERT_EQ(agent.m_TVXHBA_EnabledRecordLogCapabilities_map.size(), 2u);
+  const auto& capabilities = *agent.m_TVXHBA_EnabledRecordLogCapabilities_map[1];
   EXPECT_EQ(text(capabilities.InstanceID), "TVXHBA provider log capabilities");
   EXPECT_FALSE(capabilities.ElementNameEditSupported.is_null());
   EXPECT_FALSE(capabilities.ElementNameEditSupported.value);
   EXPECT_EQ(numbers(capabilities.RequestedStatesSupported), (std::vector<std::uint16_t>{2, 3}));
   EXPECT_EQ(numbers(capabilities.LogParamsSupported), (std::vector<std::uint16_t>{2, 3}));
   EXPECT_TRUE(ties(*agent.m_TVXHBA_RecordLogCapabilities_map[0], record, &capabilities));
-  ASSERT_EQ(agent.m_TVXHBA_ProviderUseOfLog_map.size(), 1u);
-  const auto& use = *agent.m_TVXHBA_ProviderUseOfLog_map[0];
+  EXPECT_EQ(log.count(text(record->InstanceID) + " : Logging capabilities"), 1u);
+  ASSERT_EQ(agent.m_TVXHBA_ProviderUseOfLog_map.size(), 2u);
+  const auto& use = *agent.m_TVXHBA_ProviderUseOfLog_map[1];
   EXPECT_TRUE(identical(use.Antecedent, record));
   EXPECT_TRUE(identical(use.Dependent, agent.m_TVXHBA_SoftwareIdentity_map[0]));
 }
@@ -66,7 +74,7 @@ TEST_F(Record_Log, ConformsToItsProfileAndSoDoesTheSystem) {
   ProviderAgent& agent = build();
   ASSERT_EQ(agent.m_TVXHBA_RecordLogConformsToProfile_map.size(), 1u);
   const auto& conformance = *agent.m_TVXHBA_RecordLogConformsToProfile_map[0];
-  EXPECT_TRUE(identical(conformance.ManagedElement, agent.m_TVXHBA_RecordLog_map[0]));
+  EXPECT_TRUE(identical(conformance.ManagedElement, providerLog(agent)));
   EXPECT_EQ(text(conformance.ConformantStandard->InstanceID), "TVX:Record Log");
   bool systemConforms = false;
   for (std::size_t i = 0; i < agent.m_TVXHBA_ComputerSystemConformsToProfile_map.size(); i++)

@@ -5,7 +5,9 @@
 
 namespace tvx::host {
 
+void addLogCommands(CLI::App& app, const CommandChooser& choose);
 void addPortCommands(CLI::App& app, const CommandChooser& choose);
+void addSettingsCommands(CLI::App& app, const CommandChooser& choose);
 void addStatsCommands(CLI::App& app, const CommandChooser& choose);
 
 }  // namespace tvx::host
