@@ -2,12 +2,11 @@
 
 #include <fmt/format.h>
 
-#include <charconv>
 #include <fstream>
 #include <iterator>
 
-#include "cim/DateTimeText.h"
 #include "cim/JsonText.h"
+#include "cim/ScalarText.h"
 #include "cli/ExitCode.h"
 
 namespace tvx::host {
@@ -60,85 +59,17 @@ class ValueReader {
 
   Value scalar(const std::string& text) const {
     const CMPIType type = m_Feature.cmpiType;
-    if (type == CMPI_string) {
-      return Value::string(text);
-    }
-    if (type == CMPI_boolean) {
-      return boolean(text);
-    }
-    if (type == CMPI_dateTime) {
-      if (!isDateTimeText(text)) {
-        fail(text);
-      }
-      return Value::dateTime(text);
-    }
     if (type == CMPI_ref) {
       return Value::reference(m_Resolve(text));
     }
     if (type == CMPI_instance) {
       return fromJson(text.starts_with('@') ? readFile(text.substr(1)) : text, type);
     }
-    return number(text);
-  }
-
-  Value boolean(const std::string& text) const {
-    const bool isTrue = sameName(text, "true") || text == "1";
-    if (!isTrue && !sameName(text, "false") && text != "0") {
+    std::optional<Value> value = scalarFromText(type, text);
+    if (!value) {
       fail(text);
     }
-    return Value::boolean(isTrue);
-  }
-
-  Value number(const std::string& text) const {
-    const CMPIType type = m_Feature.cmpiType;
-    if (type == CMPI_real32 || type == CMPI_real64) {
-      return real(text);
-    }
-    if (type == CMPI_char16 && text.size() == 1 && (text[0] < '0' || text[0] > '9')) {
-      return Value::number(type, static_cast<unsigned char>(text[0]));
-    }
-    const bool negative = text.starts_with('-');
-    const std::string digits = text.substr(negative ? 1 : 0);
-    const bool hex = digits.starts_with("0x") || digits.starts_with("0X");
-    const char* start = digits.data() + (hex ? 2 : 0);
-    const char* end = digits.data() + digits.size();
-    std::uint64_t magnitude = 0;
-    const auto result = std::from_chars(start, end, magnitude, hex ? 16 : 10);
-    if (start == end || result.ptr != end || result.ec != std::errc()) {
-      fail(text);
-    }
-    return inRange(text, magnitude, negative);
-  }
-
-  Value inRange(const std::string& text, std::uint64_t magnitude, bool negative) const {
-    const CMPIType type = m_Feature.cmpiType;
-    if (type < CMPI_SINT) {
-      Value value = Value::number(type, magnitude);
-      if (negative || value.asUnsigned() != magnitude) {
-        fail(text);
-      }
-      return value;
-    }
-    constexpr auto limit = static_cast<std::uint64_t>(INT64_MAX);
-    if (magnitude > limit + (negative ? 1 : 0)) {
-      fail(text);
-    }
-    const auto wide = static_cast<std::int64_t>(negative ? 0 - magnitude : magnitude);
-    Value value = Value::signedNumber(type, wide);
-    if (value.asSigned() != wide) {
-      fail(text);
-    }
-    return value;
-  }
-
-  Value real(const std::string& text) const {
-    double value = 0;
-    const char* end = text.data() + text.size();
-    const auto result = std::from_chars(text.data(), end, value);
-    if (text.empty() || result.ptr != end || result.ec != std::errc()) {
-      fail(text);
-    }
-    return Value::real(m_Feature.cmpiType, value);
+    return *std::move(value);
   }
 
   Value fromJson(const std::string& text, CMPIType type) const {

@@ -14,6 +14,7 @@ constexpr AddCommands families[] = {
     addStatsCommands,
     addLogCommands,
     addSettingsCommands,
+    addServeCommand,
 };
 
 }  // namespace

@@ -141,6 +141,13 @@ ObjectPath Session::complete(ObjectPath path, const ClassData& classData) {
                                                      reply.paths.size(), printPath(path), list));
 }
 
+void Session::keep(const ScopeReport& report) {
+  if (report.leaks()) {
+    const std::lock_guard lock(m_Mutex);
+    m_Reports.push_back(report);
+  }
+}
+
 ExitCode Session::finish() {
   const Status unloaded = m_Broker->unload(true);
   if (!m_Options.strict) {

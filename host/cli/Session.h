@@ -2,6 +2,7 @@
 #pragma once
 
 #include <memory>
+#include <mutex>
 #include <ostream>
 #include <string>
 
@@ -22,6 +23,11 @@ class Session {
   const Options& options() const { return m_Options; }
   const ClassCatalogue& classes() const { return m_Classes; }
   std::ostream& out() { return m_Out; }
+  std::ostream& err() { return m_Err; }
+  /// For commands that answer requests of others; their accounts come back through `keep`.
+  Broker& broker() { return *m_Broker; }
+  /// Keeps accounts that show a leak until the end. Safe on many threads at once.
+  void keep(const ScopeReport& report);
 
   /// The class, or CommandError (UnknownClass) with near names. A class of the --foreign store
   /// that has no description is let through as null.
@@ -47,7 +53,8 @@ class Session {
   std::ostream& m_Out;
   std::ostream& m_Err;
   std::unique_ptr<Broker> m_Broker;
-  std::vector<ScopeReport> m_Reports;
+  std::mutex m_Mutex;
+  std::vector<ScopeReport> m_Reports;  ///< guarded by m_Mutex while `keep` is in use
 };
 
 /// `name` with near names behind it: "unknown class 'X'; did you mean Y, Z?".

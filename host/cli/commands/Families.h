@@ -9,5 +9,6 @@ void addLogCommands(CLI::App& app, const CommandChooser& choose);
 void addPortCommands(CLI::App& app, const CommandChooser& choose);
 void addSettingsCommands(CLI::App& app, const CommandChooser& choose);
 void addStatsCommands(CLI::App& app, const CommandChooser& choose);
+void addServeCommand(CLI::App& app, const CommandChooser& choose);
 
 }  // namespace tvx::host
