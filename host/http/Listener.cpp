@@ -111,8 +111,11 @@ class Listener::Impl {
   void start() {
     sockaddr_storage place{};
     const bool six = fillAddress(place);
-    const unsigned flags = MHD_USE_THREAD_PER_CONNECTION | MHD_USE_INTERNAL_POLLING_THREAD |
-                           MHD_USE_POLL | (six ? MHD_USE_IPv6 : 0u);
+    unsigned flags =
+        MHD_USE_THREAD_PER_CONNECTION | MHD_USE_INTERNAL_POLLING_THREAD | MHD_USE_POLL;
+    if (six) {
+      flags |= MHD_USE_IPv6;
+    }
     const auto seconds = static_cast<unsigned>(
         std::chrono::ceil<std::chrono::seconds>(m_Options.clientLimit).count());
     errno = 0;
