@@ -183,6 +183,31 @@ class TVX_MethodWrapper {
   /// failure
   static RM_STATUS SetPortEnabled(const char* deviceId, bool enable, std::uint8_t* configStatus);
 
+  // World wide names. `status` takes the result of a method: 0, or the library's status plus 40000.
+  // `operationStatus` takes what the library tells beside its status; where no rule gives it a
+  // value it keeps the one that it has. After a change or a restore the caller owes a refresh.
+
+  /// Gives a port new names, unless a virtual port of this host has one of them: that gives 91 and
+  /// leaves the library alone. Waits for a busy adapter, up to about five minutes.
+  /// @param type 0 volatile, 1 non-volatile
+  static void ChangeWWN(const HBA_WWN& wwpn, const HBA_WWN& newWwpn, const HBA_WWN& newWwnn,
+                        std::uint16_t type, Property<std::uint16_t>& operationStatus,
+                        Property<std::uint32_t>& status);
+  /// Puts names back, waiting as `ChangeWWN` does. `status` is 0 after a failure, too.
+  /// @param type 0 factory default, 1 non-volatile
+  static void RestoreWWN(const HBA_WWN& wwpn, std::uint16_t type,
+                         Property<std::uint16_t>& operationStatus, Property<std::uint32_t>& status);
+  /// The names of one kind, in lower case with colons; left as they were without a result of 0, and
+  /// where there are no configured names.
+  /// @param type 0 volatile, 1 non-volatile, 2 factory default, 3 current, 4 configured
+  static void ReadWWN(const HBA_WWN& wwpn, std::uint16_t type, Property<String>& wwpnOut,
+                      Property<String>& wwnnOut, Property<std::uint16_t>& operationStatus,
+                      Property<std::uint32_t>& status);
+  /// What may be done with the names of a port, as a set of bits.
+  /// @param capability left as it was on failure
+  static void GetWWNCapability(const HBA_WWN& wwpn, Property<std::uint32_t>& capability,
+                               Property<std::uint32_t>& status);
+
   /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
   /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without
   /// memory the list is dropped and the result is 0.

@@ -1,9 +1,12 @@
 // What the library knows of virtual ports.
 #include <algorithm>
 #include <cstddef>
+#include <cstring>
+#include <limits>
 #include <utility>
 
 #include "access/TVX_MethodWrapper.h"
+#include "access/TVX_VPortList.h"
 #include "common/CLogger.h"
 
 namespace cimrt {
@@ -15,19 +18,19 @@ constexpr std::uint8_t ATTRIBUTES_VERSION = 3;
 static_assert(sizeof(RM_VPortList) == 28 && sizeof(RM_VPortEntry) == 24);
 static_assert(sizeof(RM_VPortAttributes) == 344 && offsetof(RM_VPortAttributes, name) == 20);
 
-RM_VPortList* listIn(const TVX_Block& block) {
-  return reinterpret_cast<RM_VPortList*>(block.get());
-}
-
-/// A list with room for `count` ports, or null with the failure logged.
+/// A list with room for `count` ports, or null.
 TVX_Block allocateList(std::uint32_t count) {
   const std::size_t size = std::size_t{count} * sizeof(RM_VPortEntry) + sizeof(std::uint32_t);
   TVX_Block block = tvxAllocate(std::max(size, sizeof(RM_VPortList)));
-  if (block)
-    listIn(block)->count = count;
-  else
-    TVX_LOG(TVX_ERR, "FABCMD_ListVPorts: Unable to allocate buffer");
+  if (block) reinterpret_cast<RM_VPortList*>(block.get())->count = count;
   return block;
+}
+
+/// One question with room for `room` ports.
+TVX_VPort_List askForVPorts(const HBA_WWN& wwpn, std::uint32_t room) {
+  TVX_VPort_List answer{allocateList(room)};
+  if (answer.block) answer.status = LRM_VPList(wwpn, &answer.list());
+  return answer;
 }
 
 RM_STATUS logFailure(RM_STATUS status) {
@@ -48,25 +51,38 @@ bool isLocal(const HBA_WWN* wwpn) {
 
 }  // namespace
 
+RM_VPortEntry TVX_VPort_List::entry(std::uint32_t i) const {
+  RM_VPortEntry record;
+  const std::size_t offset = offsetof(RM_VPortList, entry) + std::size_t{i} * sizeof record;
+  std::memcpy(&record, block.get() + offset, sizeof record);
+  return record;
+}
+
+TVX_VPort_List readVPorts(const HBA_WWN& wwpn, std::uint32_t most) {
+  std::uint32_t room = 1;
+  TVX_VPort_List answer = askForVPorts(wwpn, room);
+  if (answer.block && answer.status == RM_ERROR_MORE_DATA && answer.list().count <= most) {
+    room = answer.list().count;
+    answer = askForVPorts(wwpn, room);
+  }
+  if (answer.block && answer.status == RM_OK)
+    answer.list().count = std::min(answer.list().count, room);
+  return answer;
+}
+
 RM_STATUS TVX_MethodWrapper::ListVPorts(const HBA_WWN* wwpn, TVX_Block* list) {
   if (list == nullptr) {
     TVX_LOG(TVX_DBG, "Invalid input pointer");
     return RM_ERROR_INVALID_POINTER;
   }
   if (!isLocal(wwpn)) return RM_ERROR;
-  std::uint32_t room = 1;
-  TVX_Block block = allocateList(room);
-  if (!block) return RM_ERROR;
-  RM_STATUS status = LRM_VPList(*wwpn, listIn(block));
-  if (status == RM_ERROR_MORE_DATA) {
-    room = listIn(block)->count;
-    block = allocateList(room);
-    if (!block) return RM_ERROR;
-    status = LRM_VPList(*wwpn, listIn(block));
+  TVX_VPort_List answer = readVPorts(*wwpn, std::numeric_limits<std::uint32_t>::max());
+  if (!answer.block) {
+    TVX_LOG(TVX_ERR, "FABCMD_ListVPorts: Unable to allocate buffer");
+    return RM_ERROR;
   }
-  if (status != RM_OK) return logFailure(status);
-  listIn(block)->count = std::min(listIn(block)->count, room);
-  *list = std::move(block);
+  if (answer.status != RM_OK) return logFailure(answer.status);
+  *list = std::move(answer.block);
   TVX_LOG(TVX_DBG, "Exit the ListVPorts method");
   return RM_OK;
 }

@@ -1,5 +1,6 @@
 #include "services/Service_Checks.h"
 
+#include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
 
 namespace cimrt {
@@ -38,6 +39,35 @@ TVXHBA_FCPort* findTargetPort(ProviderAgent& agent, const Instance* target) {
   if (!target || !is_subclass(&TVXHBA_FCPort::static_meta_class, class_of(target))) return nullptr;
   const auto* port = static_cast<const TVXHBA_FCPort*>(target);
   return findFCPort(agent, port->DeviceID.is_null() ? nullptr : port->DeviceID.value.c_str());
+}
+
+bool convertPortName(const char* owner, const Property<String>& deviceID, HBA_WWN& wwpn) {
+  char hbaName[TVX_HBA_NAME_LENGTH + 1] = {};
+  const char* text = deviceID.is_null() ? nullptr : deviceID.value.c_str();
+  if (TVX_MethodWrapper::Id2HBAName(hbaName, text) != RM_OK) {
+    TVX_LOG(TVX_ERR, "%s::Id2HBAName failed", owner);
+    return false;
+  }
+  if (TVX_MethodWrapper::str2HBAName(&wwpn, hbaName) != RM_OK) {
+    TVX_LOG(TVX_ERR, "%s::str2HBAName failed", owner);
+    return false;
+  }
+  return true;
+}
+
+std::uint32_t openServiceCall(ProviderAgent& agent, const Instance_Map_Base& services,
+                              const Instance* service, const Instance* target,
+                              const Service_Texts& texts, HBA_WWN& wwpn) {
+  if (!isKnownService(services, service)) {
+    TVX_LOG(TVX_ERR, "%s", texts.unknownService);
+    return METHOD_UNKNOWN_SERVICE;
+  }
+  const TVXHBA_FCPort* port = findTargetPort(agent, target);
+  if (!port) {
+    TVX_LOG(TVX_ERR, "%s", texts.unknownPort);
+    return METHOD_UNKNOWN_PORT;
+  }
+  return convertPortName(texts.owner, port->DeviceID, wwpn) ? METHOD_OK : METHOD_UNKNOWN_PORT;
 }
 
 }  // namespace cimrt

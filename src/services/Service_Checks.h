@@ -5,6 +5,7 @@
 
 #include "agent/ProviderAgent.h"
 #include "generated/Records.h"
+#include "rmapi/rmapi.h"
 
 namespace cimrt {
 
@@ -39,5 +40,23 @@ TVXHBA_FCPort* findFCPort(ProviderAgent& agent, const char* deviceID);
 /// The same for the target of a method, which may be null or an instance of any class: what is no
 /// port at all gives null with nothing logged.
 TVXHBA_FCPort* findTargetPort(ProviderAgent& agent, const Instance* target);
+
+/// Turns a port's device id into its name. False with "<owner>::Id2HBAName failed" or
+/// "<owner>::str2HBAName failed" logged at `TVX_ERR`; a null id counts as the former.
+bool convertPortName(const char* owner, const Property<String>& deviceID, HBA_WWN& wwpn);
+
+/// How the methods of one service refuse a call.
+struct Service_Texts {
+  const char* unknownService;
+  const char* unknownPort;
+  const char* owner;  ///< as `convertPortName` takes it
+};
+
+/// What every method of a service does first: knows the service, finds the port that is meant and
+/// takes its name. METHOD_OK, or the result of the method with the reason logged at `TVX_ERR`. The
+/// caller holds the data lock.
+std::uint32_t openServiceCall(ProviderAgent& agent, const Instance_Map_Base& services,
+                              const Instance* service, const Instance* target,
+                              const Service_Texts& texts, HBA_WWN& wwpn);
 
 }  // namespace cimrt
