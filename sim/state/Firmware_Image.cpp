@@ -1,9 +1,11 @@
 #include "state/Firmware_Image.h"
 
 #include <algorithm>
+#include <array>
 #include <cstring>
+#include <filesystem>
 #include <fstream>
-#include <iterator>
+#include <system_error>
 
 namespace tvx::sim {
 namespace {
@@ -21,21 +23,42 @@ std::string field(const std::uint8_t* bytes, std::size_t room) {
   return std::string(text, strnlen(text, room));
 }
 
+// What one byte does to the sum.
+constexpr std::array<std::uint32_t, 256> crc_table() {
+  std::array<std::uint32_t, 256> table{};
+  for (std::uint32_t i = 0; i < table.size(); ++i) {
+    table[i] = i;
+    for (int bit = 0; bit < 8; ++bit)
+      table[i] = (table[i] >> 1) ^ ((table[i] & 1) != 0 ? 0xEDB88320 : 0);
+  }
+  return table;
+}
+
+// Nothing if it is no file or cannot be read whole.
+std::optional<std::vector<char>> read_file(const std::string& path) {
+  std::error_code error;
+  if (!std::filesystem::is_regular_file(path, error)) return std::nullopt;
+  const std::uintmax_t size = std::filesystem::file_size(path, error);
+  std::ifstream file(path, std::ios::binary);
+  if (error || !file) return std::nullopt;
+  std::vector<char> content(size);
+  if (!file.read(content.data(), static_cast<std::streamsize>(size))) return std::nullopt;
+  return content;
+}
+
 }  // namespace
 
 std::uint32_t crc32(const std::uint8_t* data, std::size_t size) {
+  static constexpr std::array<std::uint32_t, 256> table = crc_table();
   std::uint32_t crc = 0xFFFFFFFF;
-  for (std::size_t i = 0; i < size; ++i) {
-    crc ^= data[i];
-    for (int bit = 0; bit < 8; ++bit) crc = (crc >> 1) ^ ((crc & 1) != 0 ? 0xEDB88320 : 0);
-  }
+  for (std::size_t i = 0; i < size; ++i) crc = (crc >> 8) ^ table[(crc ^ data[i]) & 0xFF];
   return ~crc;
 }
 
 Image_Check check_image(const std::string& path, Firmware_Image& image) {
-  std::ifstream file(path, std::ios::binary);
-  if (!file) return Image_Check::Unreadable;
-  const std::vector<char> content{std::istreambuf_iterator<char>(file), {}};
+  const std::optional<std::vector<char>> read = read_file(path);
+  if (!read) return Image_Check::Unreadable;
+  const std::vector<char>& content = *read;
   const auto* bytes = reinterpret_cast<const std::uint8_t*>(content.data());
   if (content.size() < header_size || std::memcmp(bytes, magic, 8) != 0 ||
       little_endian(bytes + 8) != 1 || little_endian(bytes + 12) != content.size() - header_size ||

@@ -3,13 +3,11 @@
 #include <dlfcn.h>
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <sys/resource.h>
-
-#include <csignal>
 
 #include "Curl_Numbers.h"
 #include "access/TVX_CurlLibrary.h"
 #include "access/TVX_MethodWrapper.h"
+#include "support/Full_Disk.h"
 #include "support/Log_Capture.h"
 #include "support/Loopback_Servers.h"
 #include "support/Working_Folder.h"
@@ -21,6 +19,7 @@ using testing::Contains;
 using testing::ElementsAre;
 using testing::IsEmpty;
 using tvx::test::Ftp_Server;
+using tvx::test::Full_Disk;
 using tvx::test::Http_Server;
 using tvx::test::Log_Capture;
 using tvx::test::openDescriptors;
@@ -48,26 +47,6 @@ class Transfer : public testing::Test {
   std::string large;
   std::string path;
   bool fetched = false;
-};
-
-/// Files of this process can't grow beyond some bytes, as on a full disk.
-class Full_Disk {
- public:
-  explicit Full_Disk(rlim_t bytes) : m_Handler(std::signal(SIGXFSZ, SIG_IGN)) {
-    ::getrlimit(RLIMIT_FSIZE, &m_Before);
-    const rlimit limit{bytes, m_Before.rlim_max};
-    ::setrlimit(RLIMIT_FSIZE, &limit);
-  }
-  ~Full_Disk() {
-    ::setrlimit(RLIMIT_FSIZE, &m_Before);
-    std::signal(SIGXFSZ, m_Handler);
-  }
-  Full_Disk(const Full_Disk&) = delete;
-  Full_Disk& operator=(const Full_Disk&) = delete;
-
- private:
-  rlimit m_Before{};
-  void (*m_Handler)(int);
 };
 
 // ---- The system's libcurl ----
