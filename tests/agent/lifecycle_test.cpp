@@ -1,4 +1,5 @@
 // The agent's life: its count, what construction reads and opens, what destruction leaves.
+#include <dlfcn.h>
 #include <sys/stat.h>
 #include <unistd.h>
 
@@ -55,6 +56,29 @@ TEST_F(Lifecycle, TheNextAgentAfterTheLastReleaseIsNew) {
   EXPECT_EQ(second.m_LoadedTime.usec(), 0u);
   EXPECT_TRUE(second.m_LoadedTime.is_interval());
   EXPECT_EQ(second.m_TVXHBA_FCPort_map.size(), 0u);
+}
+
+/// A machine that has the adapter library under its older name only.
+void* openByOlderName(const char* file, int mode) {
+  const std::string name = file;
+  if (name == "liblrmapi.so") return ::dlopen("/nonexistent/liblrmapi.so", mode);
+  return ::dlopen(name == "librmapi.so" ? "liblrmapi.so" : file, mode);
+}
+
+TEST_F(Lifecycle, TheOlderLibraryIsAnErrorThatStopsNothing) {
+  static constexpr TVX_Dl_Operations OPERATIONS = {openByOlderName, ::dlsym, ::dlclose,
+                                                   []() -> const char* { return ::dlerror(); }};
+  setDlOperations(&OPERATIONS);
+  ProviderAgent& agent = startAgent();
+  EXPECT_EQ(log.count("Error : In Loading Library "), 1u);
+  EXPECT_EQ(log.level("Error : In Loading Library "), TVX_ERR);
+  EXPECT_TRUE(agent.isLoaded());
+  refresh(agent);
+  EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 4u);
+  stopAgent();
+  setDlOperations(nullptr);
+  startAgent();
+  EXPECT_EQ(log.count("Error : In Loading Library "), 1u) << "the usual library is no error";
 }
 
 TEST_F(Lifecycle, ReleaseWithoutReferenceLeavesTheCountAtZero) {

@@ -45,6 +45,7 @@ TEST_F(Discovery, FindsAdaptersAndPorts) {
   }
   EXPECT_EQ(capture.position("buildAdapterData"), 0U);
   EXPECT_EQ(capture.position("freeAllData: Entry"), 1U);
+  EXPECT_TRUE(capture.has(TVX_DBG, "freeAllData: Entry"));
 }
 
 TEST_F(Discovery, AHealthyHostIsTracedAtTheLowestLevelOnly) {

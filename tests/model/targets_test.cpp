@@ -309,6 +309,7 @@ TEST_F(Targets, SendsFourCommandsInOrder) {
   EXPECT_LT(second, third);
   EXPECT_LT(third, fourth);
   EXPECT_LT(fourth, capture.lines().size());
+  EXPECT_TRUE(capture.allAt(TVX_DBG)) << "a scan without failures is a trace";
 }
 
 TEST_F(Targets, TakesTheStandardInquiry) {

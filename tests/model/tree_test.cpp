@@ -57,6 +57,7 @@ TEST_F(Tree, TheRootAsksForTheVendorLibraries) {
   EXPECT_EQ(host.loaded, 2);
   EXPECT_THAT(capture.texts(), ElementsAre("Data Pointer Constructed.", "freeAllData: Entry",
                                            "freeAllData: cleanExit", "Data Pointer deleted."));
+  EXPECT_TRUE(capture.allAt(TVX_DBG));
 }
 
 TEST_F(Tree, IndexesOutOfRangeThrow) {
@@ -87,6 +88,7 @@ TEST_F(Tree, DestructionRunsDownTheTree) {
                   "Freeing Port: 1000000000000000", "~FCPort", "~Port", "Freeing Target: T1",
                   "Freeing Target: T2", "Freeing Port: 1000000000000001", "~FCPort", "~Port",
                   "~Adapter", "freeAllData: cleanExit"));
+  EXPECT_TRUE(capture.allAt(TVX_DBG));
   EXPECT_TRUE(data.m_Adapters.empty());
   EXPECT_TRUE(data.m_Ports.empty());
   EXPECT_EQ(data.m_AdapterCount, 0U);
@@ -118,6 +120,7 @@ TEST_F(Tree, AFailingPartDoesNotStopTheRest) {
                   "~Port", "Freeing Target: T1", "Target deletion failed !!!", "Freeing Target: T2",
                   "Freeing Port: 1000000000000001", "~FCPort", "~Port", "~Adapter",
                   "freeAllData: cleanExit"));
+  EXPECT_TRUE(capture.allAt(TVX_DBG)) << testing::PrintToString(capture.lines());
 }
 
 TEST_F(Tree, AFailingPortDoesNotStopTheRest) {
@@ -181,6 +184,7 @@ TEST_F(Tree, AFailingRescanOfAnAdapterIsPassedOver) {
   capture.forget();
   data.buildSANData();
   EXPECT_EQ(capture.position("buildSANData"), 0U);
+  EXPECT_TRUE(capture.has(TVX_DBG, "buildSANData"));
   EXPECT_TRUE(capture.has(TVX_DBG, "Target Scan from adapter: plain"));
   EXPECT_TRUE(
       capture.has(TVX_ERR, "Issue with Target Rescan with Adapter- moving to the next adapter"));

@@ -65,6 +65,12 @@ class Log_Capture : public cimrt::TVX_LoggerInterface {
     const std::vector<std::string> all = texts();
     return static_cast<std::size_t>(std::find(all.begin(), all.end(), text) - all.begin());
   }
+  /// True if nothing came at any other level.
+  bool allAt(int level) const {
+    const std::vector<Logged> all = lines();
+    return std::all_of(all.begin(), all.end(),
+                       [level](const Logged& line) { return line.level == level; });
+  }
   void forget() {
     const std::lock_guard lock(_mutex);
     _lines.clear();
