@@ -42,7 +42,9 @@ void Ranked_Mutex::lock() {
 #ifndef NDEBUG
   CIMRT_ASSERT(may_take_lock(_rank, _recursive));
 #endif
+  _waiting.fetch_add(1, std::memory_order_relaxed);
   _mutex.lock();
+  _waiting.fetch_sub(1, std::memory_order_relaxed);
 #ifndef NDEBUG
   note_lock_taken(_rank);
 #endif

@@ -1,6 +1,7 @@
 // A mutex that knows its place in the agent's lock order and, in debug builds, asserts it.
 #pragma once
 
+#include <atomic>
 #include <cstdint>
 
 #include "runtime/Threads.h"
@@ -37,10 +38,13 @@ class Ranked_Mutex {
 
   void lock();
   void unlock();
+  /// How many threads ask for it at the moment; a thread that gets it is counted no more.
+  unsigned waiting() const { return _waiting.load(std::memory_order_relaxed); }
 
  private:
   friend class Ranked_Cond;
   Mutex _mutex;
+  std::atomic<unsigned> _waiting{0};
   const Lock_Rank _rank;
   const bool _recursive;
 };

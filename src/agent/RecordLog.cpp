@@ -86,6 +86,7 @@ std::int32_t buildCapabilities(Log_Build& build) {
   build.capabilities =
       insertInto(agent.m_TVXHBA_EnabledRecordLogCapabilities_map, std::move(made),
                  "Insert Failed : m_TVXHBA_TVXHBA_EnabledRecordLogCapabilities_map");
+  if (!build.capabilities) return MAP_BUILD_FAILED;
   createAssociation(agent, Association_Kind::RECORD_LOG_CAPABILITIES,
                     formatText("%s : Logging capabilities", build.log->InstanceID.value.c_str()),
                     build.log, build.capabilities);

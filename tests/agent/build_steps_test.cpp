@@ -2,8 +2,10 @@
 #include <string>
 
 #include "Map_Test.h"
+#include "agent/HostedServices.h"
 #include "agent/MapSteps.h"
 #include "agent/Map_Insert.h"
+#include "agent/ProductSteps.h"
 
 namespace cimrt::test {
 namespace {
@@ -111,6 +113,134 @@ TEST_F(Build_Steps, RefusedAssociationsEndTheBuildWithTheirTexts) {
     EXPECT_EQ(row.step(portBuild), MAP_BUILD_FAILED) << row.text;
     EXPECT_EQ(log.level(row.text), TVX_CRIT) << row.text;
   }
+}
+
+TEST_F(Build_Steps, LaterAssociationsOfAStepEndTheBuildToo) {
+  // With the maps before it emptied the refusal comes from the last map of a step.
+  const struct {
+    Build_Step<Port_Build> step;
+    std::vector<Instance_Map_Base*> emptied;
+    const char* text;
+  } rows[] = {
+      {CreatePCIDeviceInstance,
+       {&agent->m_TVXHBA_PCIDevice_map, &agent->m_TVXHBA_PCIElementConformsToProfile_map},
+       "Insert Failed : m_TVXHBA_SystemDevice_map"},
+      {CreatePhysicalConnectorInstances,
+       {&agent->m_TVXHBA_PhysicalConnector_map, &agent->m_TVXHBA_ProductPhysicalConnector_map},
+       "Insert Failed (HBA): TVXHBA_CardContainsConnector"},
+      {CreatePhysicalConnectorInstances,
+       {&agent->m_TVXHBA_PhysicalConnector_map, &agent->m_TVXHBA_ProductPhysicalConnector_map,
+        &agent->m_TVXHBA_CardContainsConnector_map},
+       "Insert Failed (CNA): TVXHBA_ConnectorDependsOnChip"},
+      {buildSCSIController,
+       {&agent->m_TVXHBA_SCSIProtocolController_map,
+        &agent->m_TVXHBA_ProtocolControllerForPort_map},
+       "Insert Failed : m_TVXHBA_SCSIProtocolControllerSystemDevice_map"},
+      {buildPortController,
+       {&agent->m_TVXHBA_PortController_map, &agent->m_TVXHBA_ProductElementComponent_map},
+       "Insert Failed : m_TVXHBA_PHYConnectorRealizesPortController_map"},
+      {associatePortController,
+       {&agent->m_TVXHBA_ControlledBy_map, &agent->m_TVXHBA_Realizes_map},
+       "Insert Failed : m_TVXHBA_PortControllerSystemDevice_map"},
+      {buildInitiatorEndpoint,
+       {&agent->m_TVXHBA_SCSIProtocolInitiatorEndpoint_map,
+        &agent->m_TVXHBA_DeviceSAPImplementation_map},
+       "Insert Failed : m_TVXHBA_LocalHostedInitiatorAccessPoint_map"},
+      {buildTransceiver, {&agent->m_TVXHBA_Transceiver_map}, "Insert Failed : m_Component_map"},
+  };
+  for (const auto& row : rows) {
+    Host_Build hostBuild = host();
+    Adapter_Build adapterBuild = adapterOf(hostBuild);
+    Port_Build portBuild = portOf(adapterBuild);
+    // The controller and the connector go with their maps; what stands for them has their keys.
+    Ref<TVXHBA_PhysicalConnector> connector(clone(portBuild.connector));
+    Ref<TVXHBA_PortController> controller(clone(portBuild.controller));
+    portBuild.connector = connector.get();
+    portBuild.controller = controller.get();
+    for (Instance_Map_Base* map : row.emptied) map->clear();
+    EXPECT_EQ(row.step(portBuild), MAP_BUILD_FAILED) << row.text;
+    EXPECT_EQ(log.level(row.text), TVX_CRIT) << row.text;
+    refresh(*agent);
+    log.clear();
+    adapter = dynamic_cast<FCAdapter*>(agent->m_pData->m_Adapters[0]);
+    port = dynamic_cast<FCPort*>(adapter->getPort(0));
+  }
+}
+
+TEST_F(Build_Steps, CardThatStandsUnderAnotherNumberEndsTheBuild) {
+  Host_Build hostBuild = host();
+  Adapter_Build adapterBuild = adapterOf(hostBuild);
+  agent->m_TVXHBA_Card_map[0]->Tag.set(adapterBuild.attributes.SerialNumber.c_str());
+  agent->m_TVXHBA_Card_map[0]->TVXSerialNumber.set("another");
+  EXPECT_EQ(CreateCardInstances(adapterBuild), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_Card_map"), TVX_CRIT);
+  EXPECT_EQ(adapterBuild.card, nullptr);
+  EXPECT_FALSE(adapterBuild.cardIsNew);
+}
+
+TEST_F(Build_Steps, GroupThatIsInTheSystemAlreadyEndsTheBuild) {
+  Host_Build hostBuild = host();
+  Adapter_Build adapterBuild = adapterOf(hostBuild);
+  agent->m_TVXHBA_LogicalPortGroup_map.clear();
+  EXPECT_EQ(CreatePackageInstances(adapterBuild), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_HostedCollection_map"), TVX_CRIT);
+}
+
+TEST_F(Build_Steps, ServiceThatAffectsTheChipAlreadyIsNoFailure) {
+  Host_Build hostBuild = host();
+  hostBuild.installationService = agent->m_TVXHBA_SoftwareInstallationService_map[0];
+  Adapter_Build adapterBuild = adapterOf(hostBuild);
+  Port_Build portBuild = portOf(adapterBuild);
+  agent->m_TVXHBA_Chip_map.clear();
+  agent->m_TVXHBA_CardContainsChip_map.clear();
+  EXPECT_EQ(CreateChipInstances(portBuild), 0);
+  EXPECT_EQ(log.level("Insert Failed:TVXHBA_InstallServiceAffectsChip"), TVX_CRIT);
+}
+
+TEST_F(Build_Steps, AccessPointThatIsOfferedAlreadyEndsTheBuild) {
+  Host_Build hostBuild = host();
+  Ref<TVXHBA_RemoteServiceAccessPoint> page = makeInstance<TVXHBA_RemoteServiceAccessPoint>();
+  page->Name.set("https://somewhere");
+  hostBuild.accessPoint = page.get();
+  Adapter_Build adapterBuild = adapterOf(hostBuild);
+  Port_Build portBuild = portOf(adapterBuild);
+  EXPECT_EQ(offerAccessPoint(portBuild), 0);
+  EXPECT_EQ(offerAccessPoint(portBuild), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_SAPAvailableForElement_map"), TVX_CRIT);
+}
+
+TEST_F(Build_Steps, InstallationServiceNeedsItsCapabilities) {
+  Host_Build hostBuild = host();
+  agent->m_TVXHBA_SoftwareInstallationService_map.clear();
+  EXPECT_EQ(StartSoftwareInstallationService(hostBuild), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_SoftwareInstallationServiceCapabilities_map"),
+            TVX_CRIT);
+}
+
+TEST_F(Build_Steps, ProductDataThatAreTiedAlreadyStopNothing) {
+  Host_Build hostBuild = host();
+  Adapter_Build adapterBuild = adapterOf(hostBuild);
+  Port_Build portBuild = portOf(adapterBuild);
+  portBuild.pciDevice = agent->m_TVXHBA_PCIDevice_map[0];
+  agent->m_TVXHBA_VitalProductData_map.clear();
+  EXPECT_EQ(buildVitalProductData(portBuild), 0);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_ElementVPD_map"), TVX_CRIT);
+}
+
+TEST_F(Build_Steps, PortOfAnInvalidNameHasNoPCIDevice) {
+  port->m_Name = "not a name";
+  EXPECT_EQ(again(CreatePCIDeviceInstance), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("INVALID WWN"), TVX_ERR);
+  EXPECT_EQ(log.level("CreatePCIDeviceInstance failed"), TVX_CRIT);
+}
+
+TEST_F(Build_Steps, RecordLogNeedsItsCapabilities) {
+  agent->m_TVXHBA_RecordLog_map.clear();
+  agent->m_TVXHBA_RecordLogConformsToProfile_map.clear();
+  Host_Build hostBuild = host();
+  EXPECT_EQ(buildRecordLog(hostBuild), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_TVXHBA_EnabledRecordLogCapabilities_map"),
+            TVX_CRIT);
 }
 
 TEST_F(Build_Steps, ChipThatCannotBeTiedToItsCardEndsTheBuild) {

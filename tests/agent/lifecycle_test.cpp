@@ -1,15 +1,19 @@
 // The agent's life: its count, what construction reads and opens, what destruction leaves.
 #include <dlfcn.h>
+#include <pthread.h>
 #include <sys/stat.h>
+#include <syslog.h>
 #include <unistd.h>
 
 #include <fstream>
 #include <sstream>
+#include <stdexcept>
 #include <thread>
 
 #include "Agent_Fixture.h"
 #include "access/TVX_Runtime_Loader.h"
 #include "agent/Signal_Trace.h"
+#include "common/TVX_Memory.h"
 #include "model/TVX_Data.h"
 
 namespace cimrt::test {
@@ -256,6 +260,115 @@ TEST_F(Lifecycle, LibrariesAreClosedWithTheLastReference) {
   stopAgent();
   EXPECT_EQ(runtimeLibraryHandle(TVX_SLOT_LRMAPI), nullptr);
   EXPECT_EQ(runtimeLibraryHandle(TVX_SLOT_HBAAPI), nullptr);
+}
+
+/// Back end that throws at one text.
+class Throwing_Log : public TVX_LoggerInterface {
+ public:
+  explicit Throwing_Log(const char* text) : m_Text(text) { getLogger().registerInterface(this); }
+  ~Throwing_Log() override { getLogger().unregisterInterface(this); }
+  void log(int, const char*, const unsigned*, const char* text) override {
+    if (m_Text == text) throw std::runtime_error(text);
+  }
+  void open() override {}
+  void close() override {}
+  void clear() override {}
+
+ private:
+  const std::string m_Text;
+};
+
+TEST_F(Lifecycle, AFailureWhileUnloadingIsReportedAndTheNextAgentIsWhole) {
+  {
+    const Throwing_Log failing("MethodWrapper");
+    refresh(startAgent());
+    stopAgent();
+    EXPECT_EQ(log.level("Error in ProviderAgent unload. Just continue"), TVX_ERR);
+    EXPECT_EQ(log.count("Torvex Provider Unloaded"), 0u);
+  }
+  getLogger().registerInterface(&log);
+  ProviderAgent& next = startAgent();
+  refresh(next);
+  EXPECT_EQ(next.m_TVXHBA_FCPort_map.size(), 4u);
+}
+
+TEST_F(Lifecycle, AFailureWhileTheSANMapsAreClearedIsReported) {
+  ProviderAgent& agent = startAgent();
+  const Throwing_Log failing("Exiting clearSANMaps()");
+  refresh(agent);
+  EXPECT_EQ(log.level("Error in clearSANMaps()"), TVX_DBG);
+  EXPECT_TRUE(agent.m_bIsSANMapsReady);
+}
+
+TEST_F(Lifecycle, WithoutMemoryTheHostIsUnknownAndTheAgentStands) {
+  writeFile("etc/issue", "Some system");
+  tvxSetAllocator([](std::size_t) -> void* { return nullptr; });
+  ProviderAgent& agent = startAgent();
+  tvxSetAllocator(nullptr);
+  EXPECT_EQ(log.level("getOSInformation() failed"), TVX_ERR);
+  EXPECT_EQ(agent.m_OSExtendedInfo, "Unknown");
+  EXPECT_TRUE(agent.isLoaded());
+}
+
+TEST_F(Lifecycle, UnloadWaitsForAnAdapterBuildThatIsUnderWay) {
+  ProviderAgent& agent = startAgent();
+  agent.m_bIsAdapterDataBuilding = true;
+  std::thread builder([&] {
+    while (log.count("PERF: Waiting for m_bIsAdapterDataReady") == 0) std::this_thread::yield();
+    Ranked_Lock dataReady(agent.m_AdapterDataReadyMutex);
+    EXPECT_NE(agent.m_pData, nullptr);
+    agent.m_bIsAdapterDataBuilding = false;
+    agent.m_AdapterDataReadyCond.broadcast();
+  });
+  stopAgent();
+  builder.join();
+  EXPECT_EQ(log.level("PERF: Waiting for m_bIsAdapterDataReady"), TVX_DBG);
+  EXPECT_EQ(log.level("PERF: Woken up from wait for m_bIsAdapterDataReady"), TVX_DBG);
+}
+
+/// Gives new threads a stack that no machine has.
+class No_Threads {
+ public:
+  No_Threads() {
+    pthread_getattr_default_np(&m_Before);
+    pthread_attr_t huge;
+    pthread_getattr_default_np(&huge);
+    pthread_attr_setstacksize(&huge, std::size_t{1} << 46);
+    pthread_setattr_default_np(&huge);
+    pthread_attr_destroy(&huge);
+  }
+  ~No_Threads() {
+    pthread_setattr_default_np(&m_Before);
+    pthread_attr_destroy(&m_Before);
+  }
+  No_Threads(const No_Threads&) = delete;
+  No_Threads& operator=(const No_Threads&) = delete;
+
+ private:
+  pthread_attr_t m_Before;
+};
+
+TEST_F(Lifecycle, WithoutAThreadTheReaderBuildsTheMapsItself) {
+  ProviderAgent& agent = startAgent();
+  Delivered ports;
+  {
+    const No_Threads none;
+    agent.enumInstances(agent.m_TVXHBA_FCPort_map, ports.handler());
+  }
+  EXPECT_EQ(log.level("DataFetch_Handler thread could not be created"), TVX_CRIT);
+  EXPECT_EQ(ports.size(), 4u);
+  EXPECT_FALSE(agent.m_bThreadRunning);
+}
+
+TEST(SignalTraceDeathTest, TellsTheSystemLogAndEndsTheProcess) {
+  testing::FLAGS_gtest_death_test_style = "threadsafe";
+  const auto handle = [] {
+    openlog("trace", LOG_PERROR, LOG_USER);
+    signalTraceAction().sa_sigaction(SIGUSR1, nullptr, nullptr);
+  };
+  EXPECT_EXIT(handle(), testing::ExitedWithCode(1), "Signal in CIM Provider");
+  EXPECT_EXIT(handle(), testing::ExitedWithCode(1), "Back Trace Execution Path:");
+  EXPECT_EXIT(handle(), testing::ExitedWithCode(1), "Trace message \\[bt\\] ");
 }
 
 TEST(SignalTrace, IsDescribedAndNotInstalled) {

@@ -166,14 +166,23 @@ TEST_F(Refresh, AdapterStageMakesTheSANMapsStale) {
 TEST_F(Refresh, SANReaderThatComesAfterTheDecisionIsServedByTheSameRun) {
   ProviderAgent& agent = startAgent();
   agent.m_bSANRefreshSetting = false;
-  addFault(R"({"call": "LRM_GetHBAAttributes", "nth": 1, "delay_ms": 60})");
+  // The run stands still at its beginning until it can no longer end unseen.
+  std::atomic<bool> held{false};
+  std::atomic<bool> release{false};
+  std::thread holder([&] {
+    Ranked_Lock data(agent.m_DataMutex);
+    held = true;
+    while (!release) std::this_thread::yield();
+  });
+  while (!held) std::this_thread::yield();
   agent.BuildCimrtInfo();
   {
-    // The thread cannot end while this lock is held: it comes to wait for it with the adapter
-    // stage, and the decision against the SAN stage, behind it.
     Ranked_Lock lock(agent.m_ThreadMutex);
-    while (!agent.m_bIsAdapterMapsReady) std::this_thread::yield();
-    std::this_thread::sleep_for(std::chrono::milliseconds(30));
+    release = true;
+    holder.join();
+    // It asks for this lock at its end alone, with the decision against the SAN stage behind it.
+    while (agent.m_ThreadMutex.waiting() == 0) std::this_thread::yield();
+    ASSERT_TRUE(agent.m_bIsAdapterMapsReady);
     ASSERT_TRUE(agent.m_bThreadRunning);
     // What a reader does that finds the thread running: it asks, and waits.
     agent.m_bSANRefreshPending = true;

@@ -44,6 +44,24 @@ TEST_F(Lifecycle, UnloadRightBehindAReadJoinsTheRefresh) {
   }
 }
 
+TEST_F(Lifecycle, UnloadInTheMiddleOfARefreshWaitsForIt) {
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+  while (tvxsim_calls("HBA_SendReadCapacity", nullptr) == 0) std::this_thread::yield();
+  unload();
+
+  // The scan has sent its first inquiry and waits for the answer when the library is taken down.
+  useScenario();
+  addFault(R"({"call": "HBA_SendScsiInquiry", "nth": 1, "delay_ms": 30})");
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+  while (tvxsim_calls("HBA_SendScsiInquiry", nullptr) == 0) std::this_thread::yield();
+  ASSERT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), 0u) << "the scan has just begun";
+  unload();
+  EXPECT_GT(tvxsim_calls("HBA_SendReadCapacity", nullptr), 0u) << "the scan was finished";
+  EXPECT_EQ(tvxsim_open_handles(), 0u);
+}
+
 TEST_F(Lifecycle, RefusedInitialisationAnswersEveryClassEmpty) {
   addFault(R"({"call": "LRM_InitLib", "status": 1})");
   load();
