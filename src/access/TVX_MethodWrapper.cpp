@@ -16,6 +16,7 @@
 #include "access/TVX_AttributeReader.h"
 #include "common/CLogger.h"
 #include "common/TVX_Memory.h"
+#include "runtime/Lasting.h"
 #include "runtime/Threads.h"
 
 namespace cimrt {
@@ -39,8 +40,8 @@ struct Init_State {
 };
 
 Init_State& state() {
-  static Init_State instance;
-  return instance;
+  static Lasting<Init_State> instance;
+  return *instance;
 }
 
 sem_t* openSemaphore(const std::string& name, unsigned value) {

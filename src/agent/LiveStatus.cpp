@@ -81,14 +81,14 @@ void updateStatistics(ProviderAgent& agent, Port& port) {
 }  // namespace
 
 void GetFCPortStats(ProviderAgent& agent) {
-  static Live_Throttle throttle(PORT_UPDATE_PERIOD);
+  static Lasting<Live_Throttle> throttle(PORT_UPDATE_PERIOD);
   TVX_LOG(TVX_DBG, "PERF: GetFCPortStats: Entry");
-  if (!throttle.isDue()) {
+  if (!throttle->isDue()) {
     TVX_LOG(TVX_DBG, "GetFCPortStats() :Refresh Not yet required");
     return;
   }
   TVX_LOG(TVX_DBG, "GetFCPortStats(): Update");
-  throttle.start();
+  throttle->start();
   forEachFCPort(agent, [&](Adapter&, Port& port) {
     updateStatistics(agent, port);
     return true;
@@ -110,9 +110,9 @@ void setLinkState(TVXHBA_FCPort& port, const FCPortAttributes& from) {
 }
 
 void UpdateFCPortStatus(ProviderAgent& agent) {
-  static Live_Throttle throttle(PORT_UPDATE_PERIOD);
+  static Lasting<Live_Throttle> throttle(PORT_UPDATE_PERIOD);
   TVX_LOG(TVX_DBG, "PERF: UpdateFCPortStatus: Entry");
-  if (!startDriverUpdate(throttle)) return;
+  if (!startDriverUpdate(*throttle)) return;
   forEachFCPort(agent, [&](Adapter& adapter, Port& port) {
     TVXHBA_FCPort* entry =
         findContaining(agent.m_TVXHBA_FCPort_map, &TVXHBA_FCPort::DeviceID, port.m_Name);

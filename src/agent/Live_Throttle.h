@@ -4,6 +4,7 @@
 #include <cstdint>
 
 #include "common/TVX_Clock.h"
+#include "runtime/Lasting.h"
 
 namespace cimrt {
 

@@ -14,13 +14,13 @@ namespace cimrt {
 
 std::atomic<ProviderAgent*> ProviderAgent::m_pInstance{nullptr};
 std::uint32_t ProviderAgent::m_RefCount = 0;
-Ranked_Mutex ProviderAgent::m_InstanceMutex{Lock_Rank::INSTANCE};
+Lasting<Ranked_Mutex> ProviderAgent::m_InstanceMutex{Lock_Rank::INSTANCE};
 
 /// Destroys, when the module leaves the process, an agent that nobody counts: one whose libraries
 /// did not open, so that every `load` was refused. Nobody can be using it by then.
 struct Unreferenced_Agent {
   ~Unreferenced_Agent() {
-    Ranked_Lock instance(ProviderAgent::m_InstanceMutex);
+    Ranked_Lock instance(*ProviderAgent::m_InstanceMutex);
     if (ProviderAgent::m_RefCount == 0) delete ProviderAgent::m_pInstance.exchange(nullptr);
   }
 };
@@ -39,7 +39,7 @@ ProviderAgent* ProviderAgent::instanceLocked() {
 
 ProviderAgent* ProviderAgent::getInstance() {
   if (ProviderAgent* agent = m_pInstance) return agent;
-  Ranked_Lock instance(m_InstanceMutex);
+  Ranked_Lock instance(*m_InstanceMutex);
   return instanceLocked();
 }
 
@@ -49,12 +49,12 @@ void ProviderAgent::addRefLocked() {
 }
 
 void ProviderAgent::addRef() {
-  Ranked_Lock instance(m_InstanceMutex);
+  Ranked_Lock instance(*m_InstanceMutex);
   addRefLocked();
 }
 
 void ProviderAgent::releaseRef() {
-  Ranked_Lock instance(m_InstanceMutex);
+  Ranked_Lock instance(*m_InstanceMutex);
   TVX_LOG(TVX_DBG, "ProviderAgent::releaseRef[%d]", static_cast<int>(m_RefCount));
   if (m_RefCount == 0) return;
   if (--m_RefCount == 0) {
@@ -64,14 +64,14 @@ void ProviderAgent::releaseRef() {
 }
 
 std::int32_t ProviderAgent::acquire() {
-  Ranked_Lock instance(m_InstanceMutex);
+  Ranked_Lock instance(*m_InstanceMutex);
   if (!instanceLocked()->isLoaded()) return LOAD_FAILED;
   addRefLocked();
   return LOAD_OK;
 }
 
 std::uint32_t ProviderAgent::refCount() {
-  Ranked_Lock instance(m_InstanceMutex);
+  Ranked_Lock instance(*m_InstanceMutex);
   return m_RefCount;
 }
 

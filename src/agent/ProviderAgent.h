@@ -32,6 +32,7 @@
 #include "generated/Agent_Maps.h"
 #include "runtime/Datetime.h"
 #include "runtime/Instance_Map.h"
+#include "runtime/Lasting.h"
 #include "runtime/Provider_Operations.h"
 #include "runtime/Threads.h"
 
@@ -96,8 +97,8 @@ class ProviderAgent : public Agent_Maps {
   template <class T>
   void enumActiveInstances(Instance_Map<T>& map, const Instance_Handler& handler,
                            Live_Update update) {
-    static Ranked_Mutex classMutex(Lock_Rank::CLASS_STATIC, true);
-    enumActive(map, handler, update, classMutex);
+    static Lasting<Ranked_Mutex> classMutex(Lock_Rank::CLASS_STATIC, true);
+    enumActive(map, handler, update, *classMutex);
   }
   /// The same for a class that is built from the SAN, which is scanned now if it was not since the
   /// last adapter refresh.
@@ -128,6 +129,9 @@ class ProviderAgent : public Agent_Maps {
   /// as there is room. A system log that can't be read has no lines. The caller holds `m_DataMutex`
   /// and has emptied the buffer.
   void readDriverLog();
+
+  /// First of all members, and so the last to go: the logger and the like outlive the agent.
+  const At_Work m_AtWork;
 
   // --- Refresh control. Read and written from any thread; the settings come from m_ConfigFile.
   std::atomic<bool> m_bAdapterRefreshPending{true};   ///< an adapter rebuild is owed
@@ -228,7 +232,7 @@ class ProviderAgent : public Agent_Maps {
 
   static std::atomic<ProviderAgent*> m_pInstance;
   static std::uint32_t m_RefCount;  ///< guarded by m_InstanceMutex
-  static Ranked_Mutex m_InstanceMutex;
+  static Lasting<Ranked_Mutex> m_InstanceMutex;
 };
 
 }  // namespace cimrt

@@ -34,8 +34,8 @@ constexpr std::size_t PATH_LINE = 256;
 
 /// The innermost lock of the process; it goes with the library, like the logger.
 Mutex& logMutex() {
-  static Mutex mutex;
-  return mutex;
+  static Lasting<Mutex> mutex;
+  return *mutex;
 }
 
 /// The back end that a disabled logger feeds. Guarded by the log mutex.
@@ -66,8 +66,8 @@ std::string tvxFfdcLogPath() {
 }
 
 CLogger& getLogger() {
-  static CLogger logger;
-  return logger;
+  static Lasting<CLogger> logger;
+  return *logger;
 }
 
 void CLogger::log(const char* file, const unsigned* line, int level, const char* format, ...) {

@@ -7,6 +7,7 @@
 #include <vector>
 
 #include "common/TVX_Log_Backends.h"
+#include "runtime/Lasting.h"
 #include "runtime/Threads.h"
 
 namespace cimrt {
@@ -85,7 +86,7 @@ class CLogger {
   CLogger& operator=(const CLogger&) = delete;
 
  private:
-  friend CLogger& getLogger();
+  friend class Lasting<CLogger>;
   CLogger() = default;
   ~CLogger() = default;
 

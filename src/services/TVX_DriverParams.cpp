@@ -106,8 +106,8 @@ void readParameters(ProviderAgent& agent, const Port& port, const Port* first) {
 }
 
 void updateDriverMap(ProviderAgent& agent) {
-  static Live_Throttle throttle(DRIVER_UPDATE_PERIOD);
-  if (!startDriverUpdate(throttle)) return;
+  static Lasting<Live_Throttle> throttle(DRIVER_UPDATE_PERIOD);
+  if (!startDriverUpdate(*throttle)) return;
   const TVXHBA_SoftwareIdentity* driver = findDriverIdentity(agent);
   if (!driver) {
     TVX_LOG(TVX_CRIT, "Could not locate the FC DriverServiceAffectsDriver Identity");
@@ -195,15 +195,15 @@ RM_STATUS tvxcimGetDriverParam(ProviderAgent& agent, const std::string& deviceId
 }
 
 void updateLocalDriverParams(ProviderAgent& agent) {
-  static Live_Throttle throttle(DRIVER_UPDATE_PERIOD);
-  if (!startDriverUpdate(throttle)) return;
+  static Lasting<Live_Throttle> throttle(DRIVER_UPDATE_PERIOD);
+  if (!startDriverUpdate(*throttle)) return;
   containUpdate(
       [&] { forEachFCPort(agent, [&](Adapter&, Port& port) { return updatePort(agent, port); }); });
 }
 
 void updateGlobalDriverParams(ProviderAgent& agent) {
-  static Live_Throttle throttle(DRIVER_UPDATE_PERIOD);
-  if (!startDriverUpdate(throttle)) return;
+  static Lasting<Live_Throttle> throttle(DRIVER_UPDATE_PERIOD);
+  if (!startDriverUpdate(*throttle)) return;
   containUpdate([&] { updateDriver(agent); });
 }
 
