@@ -17,12 +17,21 @@ namespace tvx::test {
 /// calling process must have no other threads.
 template <class Body>
 int inChild(Body&& body) {
+  const auto failures = [] {
+    const testing::TestResult& result =
+        *testing::UnitTest::GetInstance()->current_test_info()->result();
+    int count = 0;
+    for (int i = 0; i < result.total_part_count(); ++i)
+      count += result.GetTestPartResult(i).failed() ? 1 : 0;
+    return count;
+  };
+  const int before = failures();
   std::fflush(nullptr);
   const pid_t child = fork();
   if (child == 0) {
     alarm(60);  // a child that hangs ends, and is seen as ended by a signal
     body();
-    std::exit(testing::Test::HasFailure() ? 1 : 0);
+    std::exit(failures() > before ? 1 : 0);
   }
   int status = 0;
   if (child < 0 || waitpid(child, &status, 0) != child || !WIFEXITED(status)) return -1;

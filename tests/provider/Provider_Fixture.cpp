@@ -45,8 +45,7 @@ void Provider_Test::writeFile(const std::string& path, const std::string& text) 
   std::ofstream(root / path) << text;
 }
 
-host::Broker& Provider_Test::load() {
-  host::BrokerOptions options;
+host::Broker& Provider_Test::load(host::BrokerOptions options) {
   options.strict = true;
   options.classes = classes.get();
   broker = std::make_unique<host::Broker>(options);

@@ -25,8 +25,8 @@ class Provider_Test : public ::testing::Test {
   void useScenario(const std::string& json = {});
   void addFault(const std::string& json);
   void writeFile(const std::string& path, const std::string& text);
-  /// Opens the library in a fresh broker.
-  host::Broker& load();
+  /// Opens the library in a fresh broker, which accounts for every object.
+  host::Broker& load(host::BrokerOptions options = {});
   /// Unloads everything and checks what the broker counted.
   void unload();
 
