@@ -27,6 +27,14 @@ inline constexpr std::size_t TVX_OS_INFO_SIZE = 40;
 /// Length of an HBA name text: eight pairs of digits and seven colons, without the NUL.
 inline constexpr std::size_t TVX_HBA_NAME_LENGTH = 23;
 
+/// Bytes of a dump directory.
+inline constexpr std::size_t TVX_DUMP_DIRECTORY_SIZE = 256;
+/// How many dump files can be kept.
+inline constexpr std::uint32_t TVX_LEAST_RETENTION = 1;
+inline constexpr std::uint32_t TVX_MOST_RETENTION = 20;
+/// The option of `tvxcimDumpDiagnostic` that asks for a whole dump.
+inline constexpr int TVX_WHOLE_DUMP = -1;
+
 /// What a port's location indicator can say.
 inline constexpr std::uint16_t TVX_INDICATOR_UNKNOWN = 0;
 inline constexpr std::uint16_t TVX_INDICATOR_ON = 2;
@@ -207,6 +215,53 @@ class TVX_MethodWrapper {
   /// @param capability left as it was on failure
   static void GetWWNCapability(const HBA_WWN& wwpn, Property<std::uint32_t>& capability,
                                Property<std::uint32_t>& status);
+
+  /// Turns the boot code of a port on or off. The port need not be local.
+  /// @param controlWord one character: 'e' or 'E' turns it on, 'd' or 'D' off
+  /// @return the library's status; 1 for any other character, without asking the library
+  static RM_STATUS tvxcimSetBootBiosState(const HBA_WWN& wwpn, const char* controlWord);
+  /// The state of the boot code, as the library's byte for it.
+  /// @param state left as it was on failure
+  /// @return 0, or 1 with the reason logged
+  static RM_STATUS tvxcimGetBootBiosState(const HBA_WWN& wwpn, std::uint32_t* state);
+
+  /// Has the library write a dump of a port.
+  /// @param option TVX_WHOLE_DUMP, or the number of an extended dump
+  static RM_STATUS tvxcimDumpDiagnostic(const HBA_WWN& wwpn, int option);
+  /// Removes the dump files of a local port.
+  static RM_STATUS tvxcimDeleteDumpFiles(const HBA_WWN& wwpn);
+  /// The names of the dump files of a local port.
+  /// @param list its count says how many names it holds; takes how many there are
+  /// @return RM_ERROR_LIST_TOO_SMALL if there are more; RM_ERROR_INVALID_POINTER without a list
+  static RM_STATUS GetDumpFileNames(const HBA_WWN& wwpn, RM_DumpFileNames* list);
+  /// @param directory TVX_DUMP_DIRECTORY_SIZE bytes, which a text may fill to the last
+  static RM_STATUS tvxcimGetDumpDirectory(const HBA_WWN& wwpn, char* directory);
+  static RM_STATUS tvxcimSetDumpDirectory(const HBA_WWN& wwpn, const char* path);
+  /// How many dump files of a local port are kept; left as it was on failure.
+  static RM_STATUS tvxcimGetRetentionCount(const HBA_WWN& wwpn, std::uint32_t* count);
+  /// @return RM_ERROR for a count outside TVX_LEAST_RETENTION to TVX_MOST_RETENTION
+  static RM_STATUS tvxcimSetRetentionCount(const HBA_WWN& wwpn, std::uint32_t count);
+
+  // Dumps of firmware and processor, and what the firmware logs. No class offers them yet.
+
+  /// @param flag 0 for the port's dump, anything else for the adapter's
+  static RM_STATUS tvxcimRetrieveFATDump(int flag, const HBA_WWN& wwpn);
+  /// @return 0, or 247 where a reboot has to follow; 251 for a port without core dumps
+  static RM_STATUS tvxcimGetCoreDump(const HBA_WWN& wwpn, const char* options);
+  /// @param result takes an `RM_EventLogConfig` that the caller owns; left as it was on failure
+  /// @return RM_ERROR also for more entries than there is room for
+  static RM_STATUS GetExtFATAdvancedData(const HBA_WWN& wwpn, TVX_Block* result);
+  /// Sets what one module logs. Texts longer than their 50-byte fields are cut.
+  /// @param portMask below 16
+  /// @param functionMask below 256
+  /// @param value not 0
+  static RM_STATUS SetExtFATAdvancedData(const HBA_WWN& wwpn, const char* text1, const char* text2,
+                                         std::uint32_t portMask, std::uint32_t functionMask,
+                                         std::uint32_t value);
+  static RM_STATUS tvxcimSetAdvancedDumpTraceLevel(const HBA_WWN& wwpn, std::uint32_t a,
+                                                   std::uint32_t b, std::uint32_t c,
+                                                   std::uint32_t d);
+  static RM_STATUS tvxcimRestoreDefaultSettings(const HBA_WWN& wwpn);
 
   /// Remembers every distinct name of one walk in a list that the caller starts as null and 0 and
   /// frees with `freeWWPNList`. 1 if `wwn` is in the list, else 0 with the name added. Without

@@ -115,7 +115,9 @@ constexpr Build_Step<Host_Build> CARD_STEPS[] = {
     startServices,
     buildAdapters,
     buildDriverParameters,
+    announceDumpClasses,
     buildDriverLog,
+    buildDumpClasses,
     buildVirtualPorts,
 };
 // clang-format on

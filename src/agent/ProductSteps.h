@@ -20,6 +20,10 @@ std::int32_t updateSoftwareFromFRU(Host_Build& host);
 /// The driver's parameters, of its own and of every port, and its tie to the service that sets
 /// them. Read anew at most once in five seconds, refreshes included. Never a failure of the build.
 std::int32_t buildDriverParameters(Host_Build& host);
+/// Tells in the log that the dump classes come.
+std::int32_t announceDumpClasses(Host_Build& host);
+/// The dump service and the settings of every port's dumps. Never a failure of the build.
+std::int32_t buildDumpClasses(Host_Build& host);
 /// The driver's record log, for the first FC adapter. Never a failure of the build.
 std::int32_t buildDriverLog(Host_Build& host);
 /// The virtual ports and their pools. Never a failure of the build.

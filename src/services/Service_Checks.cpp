@@ -2,6 +2,7 @@
 
 #include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
+#include "runtime/Value.h"
 
 namespace cimrt {
 
@@ -39,6 +40,15 @@ TVXHBA_FCPort* findTargetPort(ProviderAgent& agent, const Instance* target) {
   if (!target || !is_subclass(&TVXHBA_FCPort::static_meta_class, class_of(target))) return nullptr;
   const auto* port = static_cast<const TVXHBA_FCPort*>(target);
   return findFCPort(agent, port->DeviceID.is_null() ? nullptr : port->DeviceID.value.c_str());
+}
+
+TVXHBA_FCPort* findPortOfDevice(ProviderAgent& agent, const Instance* target) {
+  const Meta_Class* meta = target ? class_of(target) : nullptr;
+  const Meta_Feature* feature = meta ? find_feature(meta, "DeviceID", FLAG_PROPERTY) : nullptr;
+  Value value;
+  String deviceID;
+  if (!feature || value.get(target, feature) != 0 || value.get(deviceID) != 0) return nullptr;
+  return findFCPort(agent, value.null() ? nullptr : deviceID.c_str());
 }
 
 bool convertPortName(const char* owner, const Property<String>& deviceID, HBA_WWN& wwpn) {

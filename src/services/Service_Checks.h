@@ -41,6 +41,10 @@ TVXHBA_FCPort* findFCPort(ProviderAgent& agent, const char* deviceID);
 /// port at all gives null with nothing logged.
 TVXHBA_FCPort* findTargetPort(ProviderAgent& agent, const Instance* target);
 
+/// The agent's port with the device id of `target`, an instance of any class. Null, with nothing
+/// logged, if the class has no such property.
+TVXHBA_FCPort* findPortOfDevice(ProviderAgent& agent, const Instance* target);
+
 /// Turns a port's device id into its name. False with "<owner>::Id2HBAName failed" or
 /// "<owner>::str2HBAName failed" logged at `TVX_ERR`; a null id counts as the former.
 bool convertPortName(const char* owner, const Property<String>& deviceID, HBA_WWN& wwpn);
