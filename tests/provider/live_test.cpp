@@ -1,8 +1,6 @@
 // What clients read and change while the library runs: counters, the beacon, driver parameters,
 // units with optimized access.
-#include <algorithm>
 #include <string>
-#include <thread>
 #include <vector>
 
 #include "Provider_Fixture.h"
@@ -53,25 +51,6 @@ class Live : public Provider_Test {
   /// Takes the SAN's data in, which holds the marked units.
   void scan() { instances("TVXHBA_SCSIProtocolEndpoint"); }
 };
-
-TEST_F(Live, CountersAreReadOncePerPortInTenSecondsByAnyNumberOfClients) {
-  instances("TVXHBA_FCPort");
-  tvxsim_forget_calls();
-  addFault(R"({"call": "LRM_GetPortStatistics", "delay_ms": 5})");
-  std::vector<std::thread> clients;
-  for (int i = 0; i < 4; i++)
-    clients.emplace_back([this] {
-      for (int read = 0; read < 5; read++) {
-        const host::Reply reply = broker->enumerateInstances("TVXHBA_FCPortStatistics");
-        EXPECT_EQ(reply.status.rc, CMPI_RC_OK);
-        ASSERT_EQ(reply.instances.size(), 2u);
-        EXPECT_EQ(reply.instances[0].property("CRCErrors").asUnsigned(), 1u);
-      }
-    });
-  for (std::thread& client : clients) client.join();
-  EXPECT_EQ(tvxsim_calls("LRM_GetPortStatistics", "10000000000000A1"), 1u);
-  EXPECT_EQ(tvxsim_calls("LRM_GetPortStatistics", "10000000000000A2"), 1u);
-}
 
 TEST_F(Live, FailedReadAnswersNothingWithAGoodStatusAndServesTheRestNext) {
   instances("TVXHBA_FCPort");

@@ -136,5 +136,29 @@ TEST_F(Readers, AreNotLostWhenAServerThatTerminatesCleansUp) {
   EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
 }
 
+TEST_F(Readers, OfCountersHaveThemReadOncePerPortInTenSeconds) {
+  useScenario(R"({"cards": [
+    {"serial_number": "A", "ports": [{"wwpn": "10000000000000A1",
+      "statistics": {"crc_errors": [1, 2, 3]}}]},
+    {"serial_number": "B", "ports": [{"wwpn": "10000000000000A2"}]}]})");
+  load();
+  instances("TVXHBA_FCPort");
+  tvxsim_forget_calls();
+  addFault(R"({"call": "LRM_GetPortStatistics", "delay_ms": 5})");
+  std::vector<std::thread> clients;
+  for (int i = 0; i < 4; i++)
+    clients.emplace_back([this] {
+      for (int read = 0; read < 5; read++) {
+        const host::Reply reply = broker->enumerateInstances("TVXHBA_FCPortStatistics");
+        EXPECT_EQ(reply.status.rc, CMPI_RC_OK);
+        ASSERT_EQ(reply.instances.size(), 2u);
+        EXPECT_EQ(reply.instances[0].property("CRCErrors").asUnsigned(), 1u);
+      }
+    });
+  for (std::thread& client : clients) client.join();
+  EXPECT_EQ(tvxsim_calls("LRM_GetPortStatistics", "10000000000000A1"), 1u);
+  EXPECT_EQ(tvxsim_calls("LRM_GetPortStatistics", "10000000000000A2"), 1u);
+}
+
 }  // namespace
 }  // namespace tvx::test
