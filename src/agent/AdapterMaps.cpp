@@ -138,6 +138,7 @@ constexpr Build_Step<Host_Build> HOST_STEPS[] = {
     requireDeviceTree,
     buildOwnChassis,
     buildCards,
+    buildDiagnostics,
     updateSoftwareFromFRU,
     buildRecordLog,
 };

@@ -190,6 +190,9 @@ void ProviderAgent::clearAdapterMaps() {
   clearGroup(*this, ASSOCIATIONS);
   TVX_LOG(TVX_DBG, "Clearing Software Update maps");
   clearGroup(*this, SERVICE_ASSOCIATIONS);
+  TVX_LOG(TVX_DBG, "Clearing TVX CDM maps");
+  clearDiagnosticClasses(*this);
+  TVX_LOG(TVX_DBG, "Done with Clearing CDM maps");
   TVX_LOG(TVX_DBG, "Exiting clearAdapterMaps()");
 }
 

@@ -31,7 +31,7 @@ void setEnds(Instance* association, std::initializer_list<const Instance*> ends)
     const Meta_Feature* feature = meta->meta_features[i];
     if (!is_reference(feature)) continue;
     auto** field = static_cast<Instance**>(storage(association, feature));
-    set_reference(*field, clone(*next++));
+    if (const Instance* end = *next++) set_reference(*field, clone(end));
   }
 }
 

@@ -34,7 +34,8 @@ T* insertInto(Instance_Map<T>& map, Ref<T> instance, const char* failure) {
   return insertInstance(map, Ref<Instance>(instance.release()), failure) ? entry : nullptr;
 }
 
-/// Puts clones of the ends into the references of `association`, in the order of its class.
+/// Puts clones of the ends into the references of `association`, in the order of its class. An end
+/// that is null leaves its reference as it was.
 void setEnds(Instance* association, std::initializer_list<const Instance*> ends);
 inline void setEnds(Instance* association, const Instance* first, const Instance* second) {
   setEnds(association, {first, second});

@@ -1,6 +1,6 @@
-// Steps of the adapter maps that the folders of the services and the logs implement: product data,
-// transceivers, flash contents, driver log, virtual ports. They are declared here because the
-// agent's tables name them.
+// Steps of the adapter maps that the folders of the services, the logs and the diagnostics
+// implement: product data, transceivers, flash contents, driver log, virtual ports, tests. They are
+// declared here because the agent's tables name them.
 #pragma once
 
 #include "agent/MapBuild.h"
@@ -34,6 +34,11 @@ std::int32_t buildVirtualPorts(Host_Build& host);
 /// null. Failures are logged and leave units out.
 void readOptimizedAccess(ProviderAgent& agent, const std::string& port, const std::string& target,
                          TVXHBA_Chip* chip);
+
+/// The diagnostic tests with all that belongs to them. Never a failure of the build.
+std::int32_t buildDiagnostics(Host_Build& host);
+/// Empties the maps of the tests; what earlier runs left behind stays.
+void clearDiagnosticClasses(ProviderAgent& agent);
 
 /// Empties the maps of the virtual ports. Always 0.
 std::int32_t ClearPortVirtualizationMaps(Agent_Maps& maps);

@@ -36,7 +36,7 @@
 #pragma once
 
 #include "derivedObjects/Skeleton_Provider.h"
-#include "derivedObjects/Typed_Instance.h"
+#include "runtime/Typed_Instance.h"
 #include "generated/Methods.h"
 
 namespace cimrt {

@@ -6,19 +6,6 @@
 
 namespace cimrt {
 
-namespace {
-
-/// The agent, once it has something to say.
-ProviderAgent& readyAgent() {
-  ProviderAgent& agent = *ProviderAgent::getInstance();
-  agent.awaitAdapterMaps();
-  return agent;
-}
-
-}  // namespace
-
-Service_Call::Service_Call() : agent(readyAgent()), m_Lock(agent.m_DataMutex) {}
-
 bool isKnownService(const Instance_Map_Base& map, const Instance* service) {
   return map.size() == 0 || map.find(service) != Instance_Map_Base::npos;
 }

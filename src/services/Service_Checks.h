@@ -4,6 +4,7 @@
 #include <cstdint>
 
 #include "agent/ProviderAgent.h"
+#include "agent/Service_Call.h"
 #include "generated/Records.h"
 #include "rmapi/rmapi.h"
 
@@ -15,21 +16,6 @@ inline constexpr std::uint32_t METHOD_UNKNOWN_PORT = 32968;
 inline constexpr std::uint32_t METHOD_UNKNOWN_SERVICE = 33068;
 /// A failure of the library is answered as its status above this.
 inline constexpr std::uint32_t METHOD_LIBRARY_FAILURE = 40000;
-
-/// The frame of a method or of a change of the model: asks for a refresh if one is due, waits for
-/// the device tree and the adapter maps, and holds the agent's data lock until it goes. No agent
-/// lock may be held when it is made.
-class Service_Call {
- public:
-  Service_Call();
-  ProviderAgent& agent;
-
-  /// Gives the data lock back early; nothing of the maps may be touched after that.
-  void release() { m_Lock.release(); }
-
- private:
-  Ranked_Lock m_Lock;
-};
 
 /// True if the map of a service holds this one, by its keys. An empty map knows every service.
 bool isKnownService(const Instance_Map_Base& map, const Instance* service);
