@@ -1,0 +1,295 @@
+// bench_san [units...]: what many logical units cost, as Markdown tables. Without arguments 1,000,
+// 10,000 and 100,000 units are measured, which takes about two minutes and three gigabytes.
+#include <time.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <chrono>
+#include <cstdio>
+#include <cstdlib>
+#include <filesystem>
+#include <string>
+#include <thread>
+#include <vector>
+
+#include "Broker.h"
+#include "Child.h"
+#include "Library_Replay.h"
+#include "Memory.h"
+#include "Scenario.h"
+#include "agent/ProviderAgent.h"
+#include "model/TVX_Data.h"
+#include "schema/ClassData.h"
+#include "tvxsim/tvxsim.h"
+
+namespace tvx::bench {
+namespace {
+
+constexpr int ROUNDS = 5;  ///< of which the fastest counts
+
+std::string number(double value, int digits) {
+  char text[32];
+  std::snprintf(text, sizeof text, "%.*f", digits, value);
+  return text;
+}
+
+/// Processor time of this process in milliseconds. While anything is timed it has but one thread
+/// that works, and what else runs on the machine does not count.
+double processorTime() {
+  timespec now{};
+  clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &now);
+  return static_cast<double>(now.tv_sec) * 1e3 + static_cast<double>(now.tv_nsec) / 1e6;
+}
+
+/// Drives everything out of the processor's caches. A refresh comes minutes after the one before
+/// it, and finds none of its data there; without this, small hosts alone would.
+void coolCaches() {
+  static std::vector<char> other(std::size_t{96} << 20);
+  for (std::size_t i = 0; i < other.size(); i += 64) other[i]++;
+}
+
+/// Milliseconds of the fastest of some rounds, each of which starts with cold caches.
+template <class Work>
+double fastest(const Work& work) {
+  double best = 0;
+  for (int round = 0; round < ROUNDS; round++) {
+    coolCaches();
+    const double start = processorTime();
+    work();
+    const double taken = processorTime() - start;
+    best = round == 0 ? taken : std::min(best, taken);
+  }
+  return best;
+}
+
+void require(bool holds, const char* what) {
+  if (holds) return;
+  std::fprintf(stderr, "bench_san: %s\n", what);
+  std::exit(1);
+}
+
+/// A root folder that goes with the process.
+class Private_Root {
+ public:
+  Private_Root() {
+    std::string name = (std::filesystem::temp_directory_path() / "tvx_bench_XXXXXX").string();
+    require(mkdtemp(name.data()) != nullptr, "no temporary folder");
+    m_Path = name;
+    std::filesystem::create_directories(m_Path / "etc");
+    std::filesystem::create_directories(m_Path / "opt/ibm/platform/log");
+    setenv("TVX_ROOT", m_Path.c_str(), 1);
+  }
+  ~Private_Root() { std::filesystem::remove_all(m_Path); }
+
+ private:
+  std::filesystem::path m_Path;
+};
+
+// --- Scan, map build and memory ------------------------------------------------------------------
+
+using cimrt::Agent_Maps;
+using cimrt::ProviderAgent;
+
+struct Map_Row {
+  const char* name;
+  void (*clear)(Agent_Maps& maps);
+};
+
+template <auto MEMBER>
+void clearMap(Agent_Maps& maps) {
+  (maps.*MEMBER).clear();
+}
+
+/// The maps that a host of volumes fills. Texts are shared between the copies of an instance and
+/// are counted with the last holder, so the copies go first.
+constexpr Map_Row MAPS[] = {
+    {"paths (copies of initiator, target, volume)",
+     clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map>},
+    {"system devices (copies of system, volume)",
+     clearMap<&Agent_Maps::m_TVXHBA_StorageVolumeSystemDevice_map>},
+    {"hosted access points (copies of system, target)",
+     clearMap<&Agent_Maps::m_TVXHBA_LocalHostedAccessPoint_map>},
+    {"volumes", clearMap<&Agent_Maps::m_TVXHBA_StorageVolume_map>},
+    {"target endpoints", clearMap<&Agent_Maps::m_TVXHBA_SCSIProtocolEndpoint_map>},
+};
+
+ProviderAgent& startAgent() {
+  ProviderAgent& agent = *ProviderAgent::getInstance();
+  ProviderAgent::addRef();
+  require(agent.isLoaded(), "the simulated libraries were not found");
+  agent.m_bSANRefreshSetting = false;
+  agent.BuildCimrtInfo();
+  for (bool running = true; running;) {
+    std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    cimrt::Ranked_Lock thread(agent.m_ThreadMutex);
+    running = agent.m_bThreadRunning;
+  }
+  return agent;
+}
+
+Rows measureBuild(std::size_t units) {
+  const Private_Root root;
+  require(tvxsim_load_text(manyUnits(units, 0).c_str()) == 0, tvxsim_last_error());
+  ProviderAgent& agent = startAgent();
+  const auto scan = [&] { agent.m_pData->buildSANData(); };
+  const auto build = [&] { require(agent.updateSANMaps() == 0, "the map build failed"); };
+
+  const std::size_t residentBefore = residentBytes();
+  const std::size_t empty = allocatedBytes();
+  scan();
+  const std::size_t scanned = allocatedBytes();
+  build();
+  const std::size_t built = allocatedBytes();
+  const std::size_t resident = residentBytes() - residentBefore;
+  require(agent.m_TVXHBA_StorageVolume_map.size() == units, "units are missing");
+
+  const double libraryTime =
+      fastest([&] { require(replayScan() == units, "the library tells of other units"); });
+  const double own = fastest(scan) - libraryTime;
+  const double buildTime = fastest(build);
+
+  const auto perUnit = [&](std::size_t bytes) {
+    return number(static_cast<double>(bytes) / static_cast<double>(units), 0);
+  };
+  Rows rows = {
+      {"times", number(own, 1), number(libraryTime, 1), number(buildTime, 1), perUnit(resident)},
+      {"targets of the device tree", perUnit(scanned - empty)}};
+  std::size_t left = allocatedBytes();
+  for (const Map_Row& map : MAPS) {
+    map.clear(agent);
+    const std::size_t now = allocatedBytes();
+    rows.push_back({map.name, perUnit(left - now)});
+    left = now;
+  }
+  rows.push_back({"together", perUnit(built - empty)});
+  ProviderAgent::releaseRef();
+  return rows;
+}
+
+// --- Enumeration ---------------------------------------------------------------------------------
+
+struct Family {
+  unsigned deviceType;
+  std::vector<const char*> classes;
+};
+
+const Family FAMILIES[] = {
+    {0,
+     {"TVXHBA_SCSIProtocolEndpoint", "TVXHBA_LocalHostedAccessPoint", "TVXHBA_StorageVolume",
+      "TVXHBA_StorageVolumeSystemDevice", "TVXHBA_SCSIInitiatorTargetStorageVolumePath"}},
+    {1,
+     {"TVXHBA_TapeDrive", "TVXHBA_TapeDriveSystemDevice",
+      "TVXHBA_SCSIInitiatorTargetTapeDrivePath"}},
+    {2,
+     {"TVXHBA_StorageExtent", "TVXHBA_StorageExtentSystemDevice",
+      "TVXHBA_SCSIInitiatorTargetStorageExtentPath"}},
+    {12,
+     {"TVXHBA_SCSIArbitraryLogicalUnit", "TVXHBA_SCSIArbitraryLogicalUnitSystemDevice",
+      "TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath"}},
+    {17,
+     {"TVXHBA_LogicalDisk", "TVXHBA_LogicalDiskSystemDevice",
+      "TVXHBA_SCSIInitiatorTargetLogicalDiskPath"}},
+};
+
+Rows measureClasses(const Family& family, std::size_t units) {
+  const Private_Root root;
+  require(tvxsim_load_text(manyUnits(units, family.deviceType).c_str()) == 0, tvxsim_last_error());
+  const host::ClassCatalogue classes(host::allClasses, host::allClassCount);
+  host::BrokerOptions options;
+  options.classes = &classes;
+  host::Broker broker(options);
+  broker.load(TVX_PROVIDER_LIBRARY);
+  Rows rows;
+  for (const char* name : family.classes) {
+    require(broker.enumerateInstances(name).instances.size() == units, name);
+    rows.push_back({name, number(fastest([&] { broker.enumerateInstances(name); }), 1)});
+  }
+  broker.unload();
+  return rows;
+}
+
+// --- The report ----------------------------------------------------------------------------------
+
+void printRow(const std::vector<std::string>& cells) {
+  for (const std::string& cell : cells) std::printf("| %s ", cell.c_str());
+  std::printf("|\n");
+}
+
+void printHead(std::vector<std::string> head) {
+  printRow(head);
+  for (std::string& cell : head) cell = "---";
+  printRow(head);
+}
+
+/// Growth of the last column over the one before it, for each ten times as many units.
+std::string ratio(const std::vector<std::string>& cells) {
+  if (cells.size() < 3) return "";
+  const double before = std::atof(cells[cells.size() - 2].c_str());
+  return before > 0 ? number(std::atof(cells.back().c_str()) / before, 1) : "";
+}
+
+void printBuild(const std::vector<std::size_t>& sizes) {
+  std::vector<Rows> results;
+  for (const std::size_t units : sizes)
+    results.push_back(inChild([units] { return measureBuild(units); }));
+  printHead({"Units", "Scan less the library, ms", "Library, ms", "Map build, ms",
+             "Resident bytes a unit"});
+  for (std::size_t i = 0; i < sizes.size(); i++) {
+    std::vector<std::string> cells = results[i][0];
+    cells[0] = std::to_string(sizes[i]);
+    printRow(cells);
+  }
+  std::printf("\n");
+  printHead({"Bytes a unit, of " + std::to_string(sizes.back()) + " units", "Bytes"});
+  for (std::size_t row = 1; row < results.back().size(); row++) printRow(results.back()[row]);
+  std::printf("\n");
+}
+
+void printClasses(const std::vector<std::size_t>& sizes) {
+  std::vector<std::string> head = {"Class, ms"};
+  for (const std::size_t units : sizes) head.push_back(std::to_string(units) + " units");
+  head.push_back("last step");
+  printHead(head);
+  for (const Family& family : FAMILIES) {
+    Rows table;
+    for (const std::size_t units : sizes) {
+      const Rows rows = inChild([&family, units] { return measureClasses(family, units); });
+      if (table.empty()) table.resize(rows.size());
+      for (std::size_t i = 0; i < rows.size(); i++) {
+        if (table[i].empty()) table[i].push_back(rows[i][0]);
+        table[i].push_back(rows[i][1]);
+      }
+    }
+    for (std::vector<std::string>& row : table) {
+      row.push_back(ratio(row));
+      printRow(row);
+    }
+  }
+}
+
+/// The simulated libraries are opened by name: the linker has to know their folder from the start.
+void findLibraries(char** arguments) {
+  const char* path = std::getenv("LD_LIBRARY_PATH");
+  if (path != nullptr && std::string(path).starts_with(TVX_SIM_LIBRARIES)) return;
+  setenv("LD_LIBRARY_PATH", TVX_SIM_LIBRARIES, 1);
+  execv("/proc/self/exe", arguments);
+  require(false, "cannot start anew");
+}
+
+int run(int count, char** arguments) {
+  findLibraries(arguments);
+  std::vector<std::size_t> sizes;
+  for (int i = 1; i < count; i++)
+    sizes.push_back(std::strtoul(arguments[i], nullptr, 10) / 10 * 10);
+  if (sizes.empty()) sizes = {1'000, 10'000, 100'000};
+  printBuild(sizes);
+  printClasses(sizes);
+  return 0;
+}
+
+}  // namespace
+}  // namespace tvx::bench
+
+int main(int count, char** arguments) {
+  return tvx::bench::run(count, arguments);
+}
