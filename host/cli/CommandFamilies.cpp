@@ -11,6 +11,7 @@ using AddCommands = void (*)(CLI::App& app, const CommandChooser& choose);
 
 constexpr AddCommands families[] = {
     addPortCommands,
+    addSanCommands,
     addStatsCommands,
     addLogCommands,
     addSettingsCommands,
