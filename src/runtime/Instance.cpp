@@ -95,16 +95,6 @@ Instance* allocate(const Meta_Record* record) {
   return instance;
 }
 
-Instance* create_record(const Meta_Record* record, bool defaults) {
-  Instance* instance = allocate(record);
-  for (std::uint64_t i = 0; i < record->num_meta_features; ++i) {
-    const Meta_Feature* f = record->meta_features[i];
-    construct_feature(instance, f);
-    if (defaults && is_property(f)) apply_default(instance, as_property(f));
-  }
-  return instance;
-}
-
 void clone_property(void* to, const void* from, const Meta_Property* mp) {
   if (mp->subscript != 0) {
     ::new (to) Array_Base(*static_cast<const Array_Base*>(from));
@@ -113,17 +103,6 @@ void clone_property(void* to, const void* from, const Meta_Property* mp) {
   } else if (mp->type == DATETIME) {
     ::new (to) Datetime(*static_cast<const Datetime*>(from));
   }
-}
-
-void clone_reference(void* to, const void* from, const Meta_Reference* mr) {
-  if (mr->subscript == 0) {
-    at<Instance*>(to) = clone_or_null(*static_cast<Instance* const*>(from));
-    return;
-  }
-  const auto& source = *static_cast<const Instances*>(from);
-  auto* copy = ::new (to) Instances;
-  copy->reserve(source.size());
-  for (const Instance* element : source) copy->append(clone_or_null(element));
 }
 
 void release_property(void* p, const Meta_Property* mp) {
@@ -144,6 +123,64 @@ void release_reference(void* p, const Meta_Reference* mr) {
   auto& elements = at<Instances>(p);
   for (Instance* element : elements) unref(element);
   elements.~Instances();
+}
+
+/// Takes down a record of which the first `made` features were constructed.
+void take_down(Instance* instance, std::uint64_t made) {
+  const Meta_Record* record = instance->meta_class;
+  for (std::uint64_t i = 0; i < made; ++i) {
+    const Meta_Feature* f = record->meta_features[i];
+    if (is_property(f)) {
+      release_property(storage(instance, f), as_property(f));
+    } else if (is_reference(f)) {
+      release_reference(storage(instance, f), as_reference(f));
+    }
+  }
+  instance->__name_space.~String();
+  instance->magic = DEAD_MAGIC;
+  unref(record);
+  ::operator delete(static_cast<void*>(instance));
+}
+
+Instance* create_record(const Meta_Record* record, bool defaults) {
+  Instance* instance = allocate(record);
+  std::uint64_t made = 0;
+  try {
+    while (made < record->num_meta_features) {
+      const Meta_Feature* f = record->meta_features[made];
+      construct_feature(instance, f);
+      ++made;
+      if (defaults && is_property(f)) apply_default(instance, as_property(f));
+    }
+  } catch (...) {
+    take_down(instance, made);
+    throw;
+  }
+  return instance;
+}
+
+void clone_reference(void* to, const void* from, const Meta_Reference* mr) {
+  if (mr->subscript == 0) {
+    at<Instance*>(to) = clone_or_null(*static_cast<Instance* const*>(from));
+    return;
+  }
+  const auto& source = *static_cast<const Instances*>(from);
+  auto* copy = ::new (to) Instances;
+  try {
+    copy->reserve(source.size());
+    for (const Instance* element : source) copy->append(clone_or_null(element));
+  } catch (...) {
+    release_reference(to, mr);
+    throw;
+  }
+}
+
+void clone_feature(Instance* copy, const Instance* instance, const Meta_Feature* f) {
+  if (is_property(f)) {
+    clone_property(storage(copy, f), storage(instance, f), as_property(f));
+  } else if (is_reference(f)) {
+    clone_reference(storage(copy, f), storage(instance, f), as_reference(f));
+  }
 }
 
 }  // namespace
@@ -168,32 +205,19 @@ Instance* clone(const Instance* instance) {
   std::memcpy(reinterpret_cast<char*>(copy) + sizeof(Instance),
               reinterpret_cast<const char*>(instance) + sizeof(Instance),
               record->size - sizeof(Instance));
-  for (std::uint64_t i = 0; i < record->num_meta_features; ++i) {
-    const Meta_Feature* f = record->meta_features[i];
-    if (is_property(f)) {
-      clone_property(storage(copy, f), storage(instance, f), as_property(f));
-    } else if (is_reference(f)) {
-      clone_reference(storage(copy, f), storage(instance, f), as_reference(f));
-    }
+  std::uint64_t made = 0;
+  try {
+    for (; made < record->num_meta_features; ++made)
+      clone_feature(copy, instance, record->meta_features[made]);
+  } catch (...) {
+    take_down(copy, made);
+    throw;
   }
   return copy;
 }
 
 void destroy(Instance* instance) {
-  if (!instance) return;
-  const Meta_Record* record = instance->meta_class;
-  for (std::uint64_t i = 0; i < record->num_meta_features; ++i) {
-    const Meta_Feature* f = record->meta_features[i];
-    if (is_property(f)) {
-      release_property(storage(instance, f), as_property(f));
-    } else if (is_reference(f)) {
-      release_reference(storage(instance, f), as_reference(f));
-    }
-  }
-  instance->__name_space.~String();
-  instance->magic = DEAD_MAGIC;
-  unref(record);
-  ::operator delete(static_cast<void*>(instance));
+  if (instance) take_down(instance, instance->meta_class->num_meta_features);
 }
 
 void ref(Instance* instance) {

@@ -47,7 +47,12 @@ std::size_t Instance_Map_Base::insert(Instance* instance) {
   if (find(instance) != npos) return npos;
   const std::size_t i = _instances.size();
   _instances.append(instance);
-  _index->append(instance);
+  try {
+    _index->append(instance);
+  } catch (...) {
+    _instances.remove(i, 1);  // the caller keeps it
+    throw;
+  }
   // Who inserts an instance still holds it and may go on filling it in.
   _index->suspect(i);
   return i;
@@ -55,7 +60,9 @@ std::size_t Instance_Map_Base::insert(Instance* instance) {
 
 std::int32_t Instance_Map_Base::create_instance(const Instance* instance) {
   if (find(instance) != npos) return CREATE_INSTANCE_DUPLICATE;
-  insert(clone(instance));
+  Ref<Instance> copy(clone(instance));
+  insert(copy.get());
+  copy.release();
   return CREATE_INSTANCE_OK;
 }
 

@@ -181,12 +181,11 @@ void Key_Index::grow() {
 }
 
 void Key_Index::append(const Instance* instance) {
+  // What needs memory comes before what is seen from outside.
+  if ((_entries.size() + 1) * 2 > _slots.size()) grow();
+  if (_suspects.size() == _suspects.capacity()) _suspects.reserve(2 * _suspects.size() + 1);
   _entries.push_back(describe(instance));
-  if (_entries.size() * 2 > _slots.size()) {
-    grow();
-  } else {
-    place(_entries.size() - 1);
-  }
+  place(_entries.size() - 1);
 }
 
 void Key_Index::remove(std::size_t i) {
@@ -208,8 +207,9 @@ void Key_Index::clear() {
 }
 
 void Key_Index::suspect(std::size_t i) {
-  if (std::exchange(_entries[i].is_suspect, true)) return;
+  if (_entries[i].is_suspect) return;
   _suspects.push_back(i);
+  _entries[i].is_suspect = true;
 }
 
 void Key_Index::settle(const Array<Instance*>& instances) {
