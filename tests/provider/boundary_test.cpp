@@ -1,0 +1,151 @@
+// The border between server and library where a request is not alone: requests beside each other
+// and inside each other, and allocations that fail inside the library.
+#include <atomic>
+#include <chrono>
+#include <functional>
+#include <thread>
+
+#include "Failing_Allocations.h"
+#include "Provider_Fixture.h"
+#include "broker/Objects.h"
+#include "broker/Scope.h"
+
+namespace tvx::test {
+namespace {
+
+using host::Reply;
+
+/// A request made past the broker, whose results go through a hook.
+class Hooked_Request {
+ public:
+  Hooked_Request(host::Broker& broker, const std::string& className)
+      : m_Core(host::Core::of(broker.face())),
+        m_Interface(static_cast<CMPIInstanceMI*>(
+            broker.interface(className, host::InterfaceKind::Instance))),
+        m_ClassName(className) {}
+
+  /// Enumerates; `onInstance` runs inside the delivery of each instance.
+  int run(const std::function<void()>& onInstance) {
+    host::Scope scope(m_Core, "hooked");
+    const host::ScopeGuard guard(scope);
+    CMPIResult* result = host::makeResult(m_Core, reply);
+    CMPIResultFT table = *result->ft;
+    hook = &onInstance;
+    usual = table.returnInstance;
+    table.returnInstance = [](const CMPIResult* face, const CMPIInstance* instance) {
+      (*hook)();
+      return usual(face, instance);
+    };
+    result->ft = &table;
+    const CMPIObjectPath* path =
+        host::makePath(m_Core, {"", "root/torvex", m_ClassName, {}}, host::Origin::HandedOut);
+    const CMPIContext* context = host::makeContext(m_Core, {}, host::Origin::HandedOut);
+    return m_Interface->ft->enumerateInstances(m_Interface, context, result, path, nullptr).rc;
+  }
+
+  Reply reply;
+
+ private:
+  using Return = CMPIStatus (*)(const CMPIResult*, const CMPIInstance*);
+  static inline thread_local const std::function<void()>* hook = nullptr;
+  static inline thread_local Return usual = nullptr;
+
+  host::Core& m_Core;
+  CMPIInstanceMI* m_Interface;
+  std::string m_ClassName;
+};
+
+class Boundary : public Provider_Test {
+ protected:
+  void SetUp() override {
+    Provider_Test::SetUp();
+    load();
+    instances("TVXHBA_FCPort");
+  }
+};
+
+TEST_F(Boundary, OneClassIsServedWhileAnotherDelivers) {
+  Hooked_Request ports(*broker, "TVXHBA_FCPort");
+  std::size_t cards = 0;
+  const int code = ports.run([&] {
+    // On a thread of its own, as the server does it; the delivery waits for its answer.
+    std::thread other([&] { cards += broker->enumerateInstances("TVXHBA_Card").instances.size(); });
+    other.join();
+  });
+  EXPECT_EQ(code, CMPI_RC_OK);
+  EXPECT_EQ(ports.reply.instances.size(), 4U);
+  EXPECT_EQ(cards, 8U) << "two cards for each of the four ports";
+}
+
+TEST_F(Boundary, TheThreadOfARequestMayAskTheSameClassAgain) {
+  Hooked_Request ports(*broker, "TVXHBA_FCPort");
+  std::size_t inner = 0;
+  const int code = ports.run([&] {
+    const Reply again = broker->enumerateInstanceNames("TVXHBA_FCPort");
+    EXPECT_EQ(again.status.rc, CMPI_RC_OK);
+    EXPECT_FALSE(again.report.leaks());
+    inner += again.paths.size();
+  });
+  EXPECT_EQ(code, CMPI_RC_OK);
+  EXPECT_EQ(ports.reply.instances.size(), 4U);
+  EXPECT_EQ(inner, 16U);
+}
+
+TEST_F(Boundary, AClassLetsOneRequestInAtATime) {
+  Hooked_Request ports(*broker, "TVXHBA_FCPort");
+  std::atomic<bool> done{false};
+  std::thread other;
+  bool early = false;
+  const int code = ports.run([&] {
+    if (!other.joinable())
+      other = std::thread([&] {
+        broker->enumerateInstances("TVXHBA_FCPort");
+        done = true;
+      });
+    std::this_thread::sleep_for(std::chrono::milliseconds(2));
+    early = early || done;
+  });
+  other.join();
+  EXPECT_EQ(code, CMPI_RC_OK);
+  EXPECT_FALSE(early);
+  EXPECT_TRUE(done);
+}
+
+/// Runs a request again and again, with the first, the second... of the library's allocations
+/// failing, until it gets by without one.
+void failEveryAllocation(const std::function<Reply()>& request) {
+  const int usual = request().status.rc;  // makes the interface as well
+  int failures = 0;
+  for (long number = 0;; ++number) {
+    Allocations::failAfter(number);
+    const Reply reply = request();
+    const bool failed = Allocations::stop();
+    EXPECT_TRUE(reply.status.rc == CMPI_RC_ERR_FAILED || reply.status.rc == CMPI_RC_ERR_NOT_FOUND ||
+                reply.status.rc == usual)
+        << number << ": " << reply.status.rc;
+    EXPECT_FALSE(reply.report.leaks()) << number << reply.report.text();
+    if (!failed) break;
+    ++failures;
+    ASSERT_LT(number, 20000);
+  }
+  EXPECT_GT(failures, 0) << "nothing was allocated";
+}
+
+TEST_F(Boundary, AnAllocationThatFailsEndsTheRequestAndNoMore) {
+  ASSERT_TRUE(Allocations::watch(TVX_PROVIDER_LIBRARY));
+  const std::vector<host::Instance> before = instances("TVXHBA_FCPort");
+  const host::ObjectPath port = before.at(0).path;
+  failEveryAllocation([&] { return broker->enumerateInstances("TVXHBA_Card"); });
+  failEveryAllocation([&] { return broker->enumerateInstanceNames("TVXHBA_FCPort"); });
+  failEveryAllocation([&] { return broker->getInstance(port); });
+  failEveryAllocation([&] { return broker->associatorNames(port, "TVXHBA_ControlledBy"); });
+  failEveryAllocation([&] { return broker->associators(port, "TVXHBA_ControlledBy"); });
+  failEveryAllocation([&] { return broker->references(port, "TVXHBA_ControlledBy"); });
+  failEveryAllocation([&] { return broker->modifyInstance(before.at(0)); });
+  failEveryAllocation([&] { return broker->invokeMethod(port, "Reset"); });
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4U);
+  EXPECT_EQ(instances("TVXHBA_Card").size(), 2U);
+}
+
+}  // namespace
+}  // namespace tvx::test
