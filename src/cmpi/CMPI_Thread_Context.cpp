@@ -58,9 +58,19 @@ bool CMPI_Thread_Context::can_call(const char* name_space, const Instance* insta
 
 // ---- Threads
 
+namespace {
+
+/// Some servers know no threads of providers; one that is started there has no up-calls.
+bool can_attach(const CMPIBroker* broker) {
+  return broker && broker->bft->prepareAttachThread && broker->bft->attachThread &&
+         broker->bft->detachThread;
+}
+
+}  // namespace
+
 Thread_Context* CMPI_Thread_Context::thread_create_hook(void* /*arg*/) {
   const CMPIContext* context =
-      _broker && _context ? CBPrepareAttachThread(_broker, _context) : nullptr;
+      _context && can_attach(_broker) ? CBPrepareAttachThread(_broker, _context) : nullptr;
   return new CMPI_Thread_Context(_broker, context, _adapter, _allow_unload);
 }
 

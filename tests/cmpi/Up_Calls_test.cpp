@@ -441,29 +441,50 @@ TEST_F(Up_Calls, AThreadStartedWithoutAContextHasNone) {
   EXPECT_FALSE(had_context);
 }
 
-TEST_F(Up_Calls, AServerThatCannotAttachLeavesTheThreadWithoutUpCalls) {
-  Thread_Work work;
-  Thread thread;
-  bool found = true;
-  work.run = [&] {
-    EXPECT_NE(Thread_Context::top(), nullptr);
-    found = static_cast<bool>(cimom::get_instance(NS, part("one").get()));
-    String name;
-    EXPECT_FALSE(cimom::get_username(name));
-  };
-  in_request([&] {
-    Faulty_Broker faulty(server.broker.face());
-    faulty.up_calls().prepareAttachThread =
-        [](const CMPIBroker*, const CMPIContext*) -> CMPIContext* { return nullptr; };
-    const auto* outer = static_cast<CMPI_Thread_Context*>(Thread_Context::top());
-    CMPI_Thread_Context context(faulty.face(), outer->context(), Slot<0>::data.adapter);
-    Thread_Context::push(&context);
-    EXPECT_EQ(Thread::create_joinable(thread, &Thread_Work::start, &work), 0);
-    void* out = nullptr;
-    Thread::join(thread, out);
-    Thread_Context::pop();
-  });
-  EXPECT_FALSE(found);
+/// Starts a thread of a provider in a server whose table of up-calls was changed, and tells whether
+/// it reached the server.
+class Odd_Servers : public Up_Calls {
+ protected:
+  bool thread_reaches_server(const std::function<void(CMPIBrokerFT&)>& change) {
+    Thread_Work work;
+    Thread thread;
+    bool found = true;
+    work.run = [&] {
+      EXPECT_NE(Thread_Context::top(), nullptr);
+      found = static_cast<bool>(cimom::get_instance(NS, part("one").get()));
+      String name;
+      EXPECT_EQ(cimom::get_username(name), found);
+    };
+    in_request([&] {
+      Faulty_Broker faulty(server.broker.face());
+      change(faulty.up_calls());
+      const auto* outer = static_cast<CMPI_Thread_Context*>(Thread_Context::top());
+      CMPI_Thread_Context context(faulty.face(), outer->context(), Slot<0>::data.adapter);
+      Thread_Context::push(&context);
+      EXPECT_EQ(Thread::create_joinable(thread, &Thread_Work::start, &work), 0);
+      void* out = nullptr;
+      Thread::join(thread, out);
+      Thread_Context::pop();
+    });
+    return found;
+  }
+};
+
+TEST_F(Odd_Servers, OneThatCannotAttachLeavesTheThreadWithoutUpCalls) {
+  EXPECT_TRUE(thread_reaches_server([](CMPIBrokerFT&) {}));
+  EXPECT_FALSE(thread_reaches_server([](CMPIBrokerFT& table) {
+    table.prepareAttachThread = [](const CMPIBroker*, const CMPIContext*) -> CMPIContext* {
+      return nullptr;
+    };
+  }));
+}
+
+TEST_F(Odd_Servers, OneThatLacksTheFunctionsLeavesTheThreadWithoutUpCalls) {
+  EXPECT_FALSE(
+      thread_reaches_server([](CMPIBrokerFT& table) { table.prepareAttachThread = nullptr; }));
+  EXPECT_FALSE(thread_reaches_server([](CMPIBrokerFT& table) { table.attachThread = nullptr; }));
+  EXPECT_FALSE(thread_reaches_server([](CMPIBrokerFT& table) { table.detachThread = nullptr; }));
+  EXPECT_EQ(server.broker.openAttachments(), 0u);
 }
 
 }  // namespace
