@@ -126,7 +126,8 @@ Value Value::embedded(Instance instance) {
 }
 
 Value Value::array(CMPIType elementType, List elements) {
-  return Value(static_cast<CMPIType>(elementType | CMPI_ARRAY), std::move(elements));
+  return Value(static_cast<CMPIType>(elementType | CMPI_ARRAY),
+               std::make_shared<const List>(std::move(elements)));
 }
 
 template <class T>
@@ -179,7 +180,7 @@ const Instance& Value::asInstance() const {
 }
 
 const Value::List& Value::elements() const {
-  return get<List>("an array");
+  return *get<std::shared_ptr<const List>>("an array");
 }
 
 std::vector<std::uint64_t> Value::asUnsignedList() const {
@@ -221,7 +222,8 @@ std::string Value::display() const {
     return "instance of " + (*instance)->className();
   }
   std::string text;
-  if (const auto* list = std::get_if<List>(&m_Data)) {
+  if (const auto* shared = std::get_if<std::shared_ptr<const List>>(&m_Data)) {
+    const List* const list = shared->get();
     for (const Value& element : *list) {
       text += (text.empty() && &element == &list->front() ? "" : ", ") + element.display();
     }
@@ -239,6 +241,9 @@ bool Value::operator==(const Value& other) const {
   }
   if (const auto* instance = std::get_if<std::shared_ptr<const Instance>>(&m_Data)) {
     return samePointee(*instance, std::get<std::shared_ptr<const Instance>>(other.m_Data));
+  }
+  if (const auto* list = std::get_if<std::shared_ptr<const List>>(&m_Data)) {
+    return samePointee(*list, std::get<std::shared_ptr<const List>>(other.m_Data));
   }
   return m_Data == other.m_Data;
 }

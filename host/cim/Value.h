@@ -24,8 +24,8 @@ class ValueError : public std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
-/// One CIM value with its CMPI type code; copies are deep except for the shared, constant path or
-/// instance that a reference or embedded instance holds. Not synchronised.
+/// One CIM value with its CMPI type code; copies are deep except for the shared, constant path,
+/// instance or list that a reference, embedded instance or array holds. Not synchronised.
 class Value {
  public:
   using List = std::vector<Value>;
@@ -82,9 +82,9 @@ class Value {
   bool operator==(const Value& other) const;
 
  private:
-  using Data =
-      std::variant<std::monostate, bool, std::uint64_t, std::int64_t, double, std::string,
-                   std::shared_ptr<const ObjectPath>, std::shared_ptr<const Instance>, List>;
+  using Data = std::variant<std::monostate, bool, std::uint64_t, std::int64_t, double, std::string,
+                            std::shared_ptr<const ObjectPath>, std::shared_ptr<const Instance>,
+                            std::shared_ptr<const List>>;
 
   /// Holds `data` as what it is, without a detour over another variant.
   template <class T>

@@ -12,6 +12,7 @@ using AddCommands = void (*)(CLI::App& app, const CommandChooser& choose);
 constexpr AddCommands families[] = {
     addPortCommands,
     addSanCommands,
+    addFirmwareCommands,
     addStatsCommands,
     addLogCommands,
     addSettingsCommands,

@@ -6,6 +6,7 @@
 namespace tvx::host {
 
 void addLogCommands(CLI::App& app, const CommandChooser& choose);
+void addFirmwareCommands(CLI::App& app, const CommandChooser& choose);
 void addPortCommands(CLI::App& app, const CommandChooser& choose);
 void addSanCommands(CLI::App& app, const CommandChooser& choose);
 void addSettingsCommands(CLI::App& app, const CommandChooser& choose);
