@@ -226,11 +226,13 @@ ExitCode installFirmware(Session& session, FirmwareWords words) {
   const bool reboot = result == 0 && row.downloadStatus == waitsForReboot;
   const std::string said = installationWords(reboot ? waitsForReboot : result);
   if (session.options().format == Format::Json) {
-    nlohmann::ordered_json json = rowJson(row);
-    json["result"] = result;
-    json["words"] = said;
-    json["rebootNeeded"] = reboot;
-    printJson(session, "installation", std::move(json));
+    // What runs and what is on flash is not told here: the cache may be a refresh behind.
+    printJson(session, "installation",
+              {{"wwpn", row.wwpn},
+               {"result", result},
+               {"words", said},
+               {"downloadStatus", row.downloadStatus},
+               {"rebootNeeded", reboot}});
   } else {
     session.out() << fmt::format("{}: {} ({})\n", row.wwpn, said, result);
   }
