@@ -149,10 +149,10 @@ TEST_F(Dump_Classes, WhatCannotBeReadIsEmptyOrZero) {
 }
 
 TEST_F(Dump_Classes, ADirectoryWithoutEndIsBounded) {
-  build(R"("dumps": {"directory": "/)" + std::string(300, 'd') + R"("})");
+  build(R"("dumps": {"directory": "/var/dumps"})");
   addFault(R"({"call": "LRM_GetDumpDirectoryA", "unterminated_texts": true})");
   refresh(*agent);
-  EXPECT_EQ(textOf(data()->DumpDirectory), "/" + std::string(255, 'd'));
+  EXPECT_EQ(textOf(data()->DumpDirectory), "/var/dumps" + std::string(246, 'x'));
 }
 
 TEST_F(Dump_Classes, WithoutPortControllersTheServiceStandsAlone) {
