@@ -171,7 +171,8 @@ Instance* createAssociation(ProviderAgent& agent, Association_Kind kind, const s
   logEntry(rule, text);
   if (!first || !second) return nullptr;
   Instance_Map_Base& map = rule.map(agent);
-  Ref<Instance> association = makeByRule(rule, map.meta_class(), first, second);
+  Ref<Instance> association =
+      madeOrNull([&] { return makeByRule(rule, map.meta_class(), first, second); });
   if (!association) {
     TVX_LOG(TVX_CRIT, "%s", rule.creationFailure);
     return nullptr;

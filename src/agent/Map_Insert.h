@@ -5,6 +5,7 @@
 #pragma once
 
 #include <initializer_list>
+#include <new>
 #include <string>
 #include <utility>
 
@@ -18,6 +19,16 @@ Ref<T> makeInstance(const char* nameSpace = PROVIDER_NAME_SPACE) {
   Ref<T> instance(T::create());
   instance->__name_space = nameSpace;
   return instance;
+}
+
+/// What `make()` makes, or null when memory ran out on the way.
+template <class Make>
+auto madeOrNull(Make make) -> decltype(make()) {
+  try {
+    return make();
+  } catch (const std::bad_alloc&) {
+    return {};
+  }
 }
 
 /// Formats a text as `printf` does.

@@ -230,12 +230,30 @@ namespace {
 /// 0, MAP_BUILD_FAILED, or MAP_BUILD_LEAVE_PORT for a port without a PCI view.
 std::int32_t conformDevice(ProviderAgent& agent, const Device* device) {
   const TVXHBA_RegisteredProfile* profile = findRegisteredProfile(agent, "PCI Device");
-  if (!profile) {
+  Ref<TVXHBA_PCIElementConformsToProfile> conformance = madeOrNull([&] {
+    return profile ? makeAssociation<TVXHBA_PCIElementConformsToProfile>(profile, device)
+                   : Ref<TVXHBA_PCIElementConformsToProfile>();
+  });
+  if (!conformance) {
     TVX_LOG(TVX_CRIT, "Failed to create TVXHBA_PCIElementConformsToProfile");
     return MAP_BUILD_LEAVE_PORT;
   }
-  return associate(agent.m_TVXHBA_PCIElementConformsToProfile_map, profile, device,
-                   "Insert Failed : m_TVXHBA_PCIElementConformsToProfile_map")
+  return insertInto(agent.m_TVXHBA_PCIElementConformsToProfile_map, std::move(conformance),
+                    "Insert Failed : m_TVXHBA_PCIElementConformsToProfile_map")
+             ? 0
+             : MAP_BUILD_FAILED;
+}
+
+/// The device in the system.
+std::int32_t placeDevice(const Host_Build& host, const Device* device) {
+  Ref<TVXHBA_SystemDevice> place =
+      madeOrNull([&] { return makeAssociation<TVXHBA_SystemDevice>(host.system, device); });
+  if (!place) {
+    TVX_LOG(TVX_CRIT, "Failed to create TVXHBA_SystemDevice");
+    return MAP_BUILD_FAILED;
+  }
+  return insertInto(host.agent.m_TVXHBA_SystemDevice_map, std::move(place),
+                    "Insert Failed : m_TVXHBA_SystemDevice_map")
              ? 0
              : MAP_BUILD_FAILED;
 }
@@ -250,10 +268,7 @@ std::int32_t buildDevice(Port_Build& build) {
   if (!build.pciDevice) return MAP_BUILD_FAILED;
   const std::int32_t result = conformDevice(host.agent, build.pciDevice);
   if (result != 0) return result;
-  return associate(host.agent.m_TVXHBA_SystemDevice_map, host.system, build.pciDevice,
-                   "Insert Failed : m_TVXHBA_SystemDevice_map")
-             ? 0
-             : MAP_BUILD_FAILED;
+  return placeDevice(host, build.pciDevice);
 }
 
 }  // namespace

@@ -1,8 +1,6 @@
 // Making instances where a lack of memory has a message of its own.
 #pragma once
 
-#include <new>
-
 #include "agent/Map_Insert.h"
 
 namespace cimrt {
@@ -11,12 +9,9 @@ namespace cimrt {
 /// ran out on the way.
 template <class Make>
 auto tryMake(const char* failure, Make make) -> decltype(make()) {
-  try {
-    if (auto made = make()) return made;
-  } catch (const std::bad_alloc&) {
-  }
-  TVX_LOG(TVX_CRIT, "%s", failure);
-  return {};
+  auto made = madeOrNull(make);
+  if (!made) TVX_LOG(TVX_CRIT, "%s", failure);
+  return made;
 }
 
 }  // namespace cimrt

@@ -69,11 +69,13 @@ void setCommon(TVXHBA_FlashImageSoftwareIdentity& image, const Flash_Build& buil
 }
 
 RM_STATUS tieToElement(const Flash_Build& build, const Instance* image) {
-  if (!build.element) {
+  using Tie = TVXHBA_ElementFlashImageSoftwareIdentity;
+  Ref<Tie> tie = madeOrNull(
+      [&] { return build.element ? makeAssociation<Tie>(image, build.element) : Ref<Tie>(); });
+  if (!tie) {
     TVX_LOG(TVX_DBG, "Failed to create ElementFlashImageSoftwareIdentityInst");
     return RM_OK;
   }
-  auto tie = makeAssociation<TVXHBA_ElementFlashImageSoftwareIdentity>(image, build.element);
   tie->UpgradeCondition.set(UPGRADE_BY_PACKAGES);
   tie->ElementSoftwareStatus.set({STATUS_INSTALLED});
   return insertInto(build.agent.m_TVXHBA_ElementFlashImageSoftwareIdentity_map, std::move(tie),

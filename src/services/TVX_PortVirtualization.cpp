@@ -41,10 +41,11 @@ bool convertName(const char* deviceID, HBA_WWN& wwn, int level) {
   return true;
 }
 
-/// Inserts what was made. 0, or the result for an instance that could not be made or inserted.
-template <class T>
-std::int32_t store(Instance_Map<T>& map, Ref<T> instance, const char* notCreated, int level,
+/// Makes an instance and inserts it. 0, or the result for one that could not be made or inserted.
+template <class T, class Make>
+std::int32_t store(Instance_Map<T>& map, Make make, const char* notCreated, int level,
                    const char* notInserted, const char* done) {
+  Ref<T> instance = madeOrNull(make);
   if (!instance) {
     TVX_LOG(level, "%s", notCreated);
     return VPORT_NO_INSTANCE;
@@ -70,17 +71,19 @@ Ref<TVXHBA_ResourcePool> makePool(const char* deviceID, std::uint32_t count) {
 std::int32_t buildPool(Physical_Port& physical, std::uint32_t count) {
   auto& map = physical.agent.m_TVXHBA_ResourcePool_map;
   if (const std::int32_t result = store(
-          map, makePool(physical.deviceID, count), "Failed to create ResourcePool", TVX_ERR,
-          "Insert Failed : m_TVXHBA_ResourcePool_map", "Resource Pool created and inserted in map");
+          map, [&] { return makePool(physical.deviceID, count); }, "Failed to create ResourcePool",
+          TVX_ERR, "Insert Failed : m_TVXHBA_ResourcePool_map",
+          "Resource Pool created and inserted in map");
       result != 0)
     return result;
   physical.pool = map[map.size() - 1];
   TVX_LOG(TVX_DBG, "Creating HostedResource pool ");
-  return store(physical.agent.m_TVXHBA_HostedResourcePool_map,
-               makeAssociation<TVXHBA_HostedResourcePool>(physical.system, physical.pool),
-               "Failed to create HostedResourcePool", TVX_CRIT,
-               "Insert Failed : m_TVXHBA_HostedResourcePool_map",
-               "HostedResource Pool created and inserted in map");
+  return store(
+      physical.agent.m_TVXHBA_HostedResourcePool_map,
+      [&] { return makeAssociation<TVXHBA_HostedResourcePool>(physical.system, physical.pool); },
+      "Failed to create HostedResourcePool", TVX_CRIT,
+      "Insert Failed : m_TVXHBA_HostedResourcePool_map",
+      "HostedResource Pool created and inserted in map");
 }
 
 /// The name text of a virtual port, if the library gives its attributes.
@@ -115,19 +118,20 @@ Ref<TVXHBA_VirtualFCPort> makeVirtualPort(const Physical_Port& physical, const s
 
 std::int32_t associateVirtualPort(Physical_Port& physical, const TVXHBA_VirtualFCPort* port) {
   ProviderAgent& agent = physical.agent;
-  if (const std::int32_t result =
-          store(agent.m_TVXHBA_VPortHostedDependency_map,
-                makeAssociation<TVXHBA_VPortHostedDependency>(physical.port, port),
-                "Failed to create VPortHostedDependency", TVX_CRIT,
-                "Insert Failed : m_TVXHBA_VPortHostedDependency_map",
-                "VPortHostedDependency created and inserted in map");
+  if (const std::int32_t result = store(
+          agent.m_TVXHBA_VPortHostedDependency_map,
+          [&] { return makeAssociation<TVXHBA_VPortHostedDependency>(physical.port, port); },
+          "Failed to create VPortHostedDependency", TVX_CRIT,
+          "Insert Failed : m_TVXHBA_VPortHostedDependency_map",
+          "VPortHostedDependency created and inserted in map");
       result != 0)
     return result;
-  return store(agent.m_TVXHBA_ElementAllocatedFromPool_map,
-               makeAssociation<TVXHBA_ElementAllocatedFromPool>(physical.pool, port),
-               "Failed to create ElementAllocatedFromPool", TVX_CRIT,
-               "Insert Failed : m_TVXHBA_ElementAllocatedFromPool_map",
-               "ElementAllocatedFromPool created and inserted in map");
+  return store(
+      agent.m_TVXHBA_ElementAllocatedFromPool_map,
+      [&] { return makeAssociation<TVXHBA_ElementAllocatedFromPool>(physical.pool, port); },
+      "Failed to create ElementAllocatedFromPool", TVX_CRIT,
+      "Insert Failed : m_TVXHBA_ElementAllocatedFromPool_map",
+      "ElementAllocatedFromPool created and inserted in map");
 }
 
 std::int32_t buildVirtualPort(Physical_Port& physical, const RM_VPortEntry& entry) {
@@ -136,11 +140,14 @@ std::int32_t buildVirtualPort(Physical_Port& physical, const RM_VPortEntry& entr
   TVX_LOG(TVX_DBG, "VPort Id :%s Node name: %s", wwpn.c_str(), wwnn.c_str());
   HBA_WWN name{};
   if (!convertName(wwpn.c_str(), name, TVX_DBG)) return VPORT_FAILED;
-  Ref<TVXHBA_VirtualFCPort> made = makeVirtualPort(physical, wwpn, wwnn, entry.fcId);
-  if (made) setName(*made, physical, name);
+  const auto make = [&] {
+    Ref<TVXHBA_VirtualFCPort> made = makeVirtualPort(physical, wwpn, wwnn, entry.fcId);
+    setName(*made, physical, name);
+    return made;
+  };
   auto& map = physical.agent.m_TVXHBA_VirtualFCPort_map;
-  if (const std::int32_t result = store(map, std::move(made), "Failed to create VirtualFCPort",
-                                        TVX_CRIT, "Insert Failed : m_TVXHBA_VirtualFCPort_map",
+  if (const std::int32_t result = store(map, make, "Failed to create VirtualFCPort", TVX_CRIT,
+                                        "Insert Failed : m_TVXHBA_VirtualFCPort_map",
                                         "Created VirtualFCPort and inserted in map");
       result != 0)
     return result;

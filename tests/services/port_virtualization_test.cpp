@@ -1,6 +1,7 @@
 // Virtual ports and their pools.
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
+#include "../logs/Failing_New.h"
 #include "access/TVX_MethodWrapper.h"
 #include "agent/Map_Insert.h"
 #include "agent/ProductSteps.h"
@@ -239,6 +240,45 @@ TEST_F(Port_Virtualization, RefusedInsertStopsAndKeepsWhatIsThere) {
   EXPECT_EQ(agent.m_TVXHBA_VirtualFCPort_map.size(), 2u);
   EXPECT_EQ(agent.m_TVXHBA_ResourcePool_map.size(), 2u);
   EXPECT_EQ(log.count("PERF: updateAdapterMaps: cleanExit"), 1u);
+}
+
+TEST_F(Port_Virtualization, ALackOfMemoryIsToldForEachClass) {
+  ProviderAgent& agent = build(TWO);
+  Ranked_Lock data(agent.m_DataMutex);
+  const struct {
+    std::size_t size;
+    const char* text;
+    int level;
+  } rows[] = {
+      {TVXHBA_ResourcePool::static_meta_class.size, "Failed to create ResourcePool", TVX_ERR},
+      {TVXHBA_HostedResourcePool::static_meta_class.size, "Failed to create HostedResourcePool",
+       TVX_CRIT},
+      {TVXHBA_VirtualFCPort::static_meta_class.size, "Failed to create VirtualFCPort", TVX_CRIT},
+      {TVXHBA_VPortHostedDependency::static_meta_class.size,
+       "Failed to create VPortHostedDependency", TVX_CRIT},
+      {TVXHBA_ElementAllocatedFromPool::static_meta_class.size,
+       "Failed to create ElementAllocatedFromPool", TVX_CRIT},
+  };
+  for (const auto& row : rows) {
+    // Associations of one size differ by the order in which they are made.
+    for (int spare = 0; spare < 8 && log.level(row.text) == -1; spare++) {
+      const Failing_New failing(row.size, spare);
+      EXPECT_EQ(TVX_PortVirtualization::CreatePortVirtualizationClasses(agent), VPORT_NO_INSTANCE);
+    }
+    EXPECT_EQ(log.level(row.text), row.level) << row.text;
+  }
+}
+
+TEST_F(Port_Virtualization, PortsOfOneNameAreRefusedTheSecondPool) {
+  ProviderAgent& agent = build(TWO);
+  Ranked_Lock data(agent.m_DataMutex);
+  auto& ports = agent.m_TVXHBA_FCPort_map;
+  Ref<TVXHBA_FCPort> twin(clone(ports[0]));
+  twin->SystemName.set("another system");
+  ASSERT_NE(ports.insert(twin.get()), Instance_Map_Base::npos);
+  twin.release();
+  EXPECT_EQ(TVX_PortVirtualization::CreatePortVirtualizationClasses(agent), VPORT_FAILED);
+  EXPECT_EQ(log.level("Insert Failed : m_TVXHBA_ResourcePool_map"), TVX_CRIT);
 }
 
 TEST_F(Port_Virtualization, PortWithAnOddDeviceIdStops) {

@@ -1,0 +1,63 @@
+// What the builders of the maps say when memory runs out.
+#include "../logs/Failing_New.h"
+#include "Map_Test.h"
+#include "agent/Associations.h"
+#include "agent/MapSteps.h"
+
+namespace cimrt::test {
+namespace {
+
+class No_Memory : public Adapter_Maps {
+ protected:
+  /// Builds the PCI device of the first port again, short of blocks of that size but for
+  /// `spare` of them.
+  std::int32_t buildDevice(ProviderAgent& agent, std::size_t size, int spare) {
+    auto& adapter = dynamic_cast<FCAdapter&>(*agent.m_pData->m_Adapters[0]);
+    auto& port = dynamic_cast<FCPort&>(*adapter.getPort(0));
+    Host_Build host{agent};
+    host.system = agent.m_CIM_ComputerSystem_map[0];
+    Adapter_Build adapterBuild{host, adapter,
+                               dynamic_cast<const FCAdapterAttributes&>(*adapter.getAttributes())};
+    Port_Build build{adapterBuild, port,
+                     dynamic_cast<const FCPortAttributes&>(*port.getAttributes())};
+    agent.m_TVXHBA_PCIDevice_map.clear();
+    agent.m_TVXHBA_PCIElementConformsToProfile_map.clear();
+    agent.m_TVXHBA_SystemDevice_map.clear();
+    const Failing_New failing(size, spare);
+    return CreatePCIDeviceInstance(build);
+  }
+};
+
+TEST_F(No_Memory, PortWithoutItsConformanceHasNoPCIView) {
+  ProviderAgent& agent = build();
+  EXPECT_EQ(buildDevice(agent, TVXHBA_PCIElementConformsToProfile::static_meta_class.size, 0),
+            MAP_BUILD_LEAVE_PORT);
+  EXPECT_EQ(log.level("Failed to create TVXHBA_PCIElementConformsToProfile"), TVX_CRIT);
+}
+
+TEST_F(No_Memory, DeviceWithoutItsPlaceEndsTheBuild) {
+  ProviderAgent& agent = build();
+  // The conformance before it has the same size.
+  const std::size_t size = TVXHBA_SystemDevice::static_meta_class.size;
+  const int spare = size == TVXHBA_PCIElementConformsToProfile::static_meta_class.size ? 1 : 0;
+  EXPECT_EQ(buildDevice(agent, size, spare), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Failed to create TVXHBA_SystemDevice"), TVX_CRIT);
+  EXPECT_EQ(log.level("CreatePCIDeviceInstance failed"), TVX_CRIT);
+}
+
+TEST_F(No_Memory, EveryKindOfAssociationTellsThatItCouldNotBeMade) {
+  ProviderAgent& agent = build();
+  const Instance* end = agent.m_CIM_ComputerSystem_map[0];
+  for (std::size_t i = 0; i < static_cast<std::size_t>(Association_Kind::COUNT); i++) {
+    const Association_Rule& rule = associationRule(static_cast<Association_Kind>(i));
+    log.clear();
+    {
+      const Failing_New failing(rule.map(agent).meta_class()->size);
+      EXPECT_EQ(createAssociation(agent, rule.kind, "", end, end), nullptr) << rule.className;
+    }
+    EXPECT_EQ(log.level(rule.creationFailure), TVX_CRIT) << rule.className;
+  }
+}
+
+}  // namespace
+}  // namespace cimrt::test
