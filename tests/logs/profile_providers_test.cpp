@@ -103,6 +103,7 @@ TEST_F(Profile_Providers, ProfileRegistrationRefersToTwelve) {
   startAgent();
   Delivered delivered;
   EXPECT_EQ(TVXHBA_ReferencedProfile_Provider().enum_instances(nullptr, delivered.handler()), 0);
+  EXPECT_EQ(log.level("TVXHBA_ReferencedProfile_Provider::enum_instances()"), TVX_DBG);
   ASSERT_EQ(delivered.size(), REFERENCED.size());
   for (std::size_t i = 0; i < REFERENCED.size(); i++) {
     const auto* association = delivered.at<TVXHBA_ReferencedProfile>(i);
@@ -152,6 +153,7 @@ TEST_F(Profile_Providers, SecondResultIsTheBaseServerProfile) {
   EXPECT_EQ(
       TVXHBA_BaseServerReferencedProfile_Provider().enum_instances(nullptr, delivered.handler()),
       0);
+  EXPECT_EQ(log.level("TVXHBA_BaseServerReferencedProfile_Provider::enum_instances()"), TVX_DBG);
   EXPECT_EQ(server.nameSpace, "root/pg_interop");
   EXPECT_EQ(server.className, "PG_RegisteredProfile");
   EXPECT_EQ(server.destroyed, 1u);

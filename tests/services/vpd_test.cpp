@@ -1,5 +1,6 @@
 // Vital product data of a port, and of field replaceable units.
 #include <cstdlib>
+#include <new>
 
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
@@ -373,6 +374,32 @@ TEST_F(Fru, RefusedAssociationFailsTheBuild) {
   log.clear();
   EXPECT_EQ(TVX_Vpd::UpdateFRUToCard(agent, card, Chip_Kind::OTHER, "", PORT, 0), 32769);
   EXPECT_EQ(log.level("Insert Failed : TVXHBA_FRUElementVPD"), TVX_CRIT);
+}
+
+TEST_F(Fru, RefusedAssociationOfAPortIsCritical) {
+  ProviderAgent& agent = build(ALL);
+  agent.m_TVXHBA_Card_map[0]->SKU.set("");
+  agent.m_TVXHBA_FRUVitalProductData_map.clear();
+  auto& adapter = dynamic_cast<FCAdapter&>(*agent.m_pData->m_Adapters[0]);
+  auto& port = dynamic_cast<FCPort&>(*adapter.getPort(0));
+  Host_Build host{agent};
+  Adapter_Build adapterBuild{host, adapter,
+                             dynamic_cast<const FCAdapterAttributes&>(*adapter.getAttributes())};
+  adapterBuild.card = agent.m_TVXHBA_Card_map[0];
+  Port_Build build{adapterBuild, port,
+                   dynamic_cast<const FCPortAttributes&>(*port.getAttributes())};
+  EXPECT_EQ(updateCardFromFRU(build), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Update FRU related class failed"), TVX_CRIT);
+}
+
+TEST_F(Fru, AnExceptionDuringTheUpdateOfTheSoftwareIsToldAndStopsNothing) {
+  ProviderAgent& agent = build(ALL);
+  Host_Build host{agent};
+  tvxSetAllocator([](std::size_t) -> void* { throw std::bad_alloc(); });
+  EXPECT_EQ(updateSoftwareFromFRU(host), 0);
+  EXPECT_EQ(log.level("Exception occured during FRU update to cim_ "
+                      "Softwareidentity/PhysicalPackage instances"),
+            TVX_ERR);
 }
 
 TEST_F(Fru, SoftwareOfThePortTakesTheUnitsData) {
