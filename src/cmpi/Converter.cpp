@@ -20,9 +20,11 @@ const Meta_Repository* repository_of(const Instance* instance) {
 int read(Container& container, const Meta_Record* record, std::uint32_t flags,
          const char* name_space, Instance*& out) {
   Instance* instance = nullptr;
-  if (container.convert(record, flags, instance) != 0 || !instance) return CONVERSION_FAILED;
-  set_name_space(instance, name_space, false);
-  out = instance;
+  const int code = container.convert(record, flags, instance);
+  Ref<Instance> made(instance);
+  if (code != 0 || !made) return CONVERSION_FAILED;
+  set_name_space(made.get(), name_space, false);
+  out = made.release();
   return 0;
 }
 
