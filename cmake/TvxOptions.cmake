@@ -7,6 +7,10 @@ if(CMAKE_CXX_COMPILER_ID STREQUAL "GNU" AND CMAKE_CXX_FLAGS_DEBUG MATCHES "-fsan
   # GCC's own documentation: with a sanitizer this one warns falsely (here inside <regex>). The plain builds keep it.
   target_compile_options(tvx_warnings INTERFACE -Wno-maybe-uninitialized)
 endif()
+if(CMAKE_CXX_COMPILER_ID STREQUAL "Clang")
+  # Part of -Wconversion for clang alone; the code is written to GCC's meaning of it.
+  target_compile_options(tvx_warnings INTERFACE -Wno-sign-conversion)
+endif()
 # Paths in log lines and assertions are relative to the source tree, never those of the build machine. Coverage needs the
 # true ones to find the sources.
 if(NOT CMAKE_CXX_FLAGS_DEBUG MATCHES "--coverage")

@@ -1,19 +1,6 @@
 #include "agent/Map_Insert.h"
 
-#include <cstdarg>
-
-#include "runtime/Buffer.h"
-
 namespace cimrt {
-
-std::string formatText(const char* format, ...) {
-  Buffer buffer;
-  va_list args;
-  va_start(args, format);
-  buffer.vformat(format, args);
-  va_end(args);
-  return std::string(buffer.data(), buffer.size());
-}
 
 bool insertInstance(Instance_Map_Base& map, Ref<Instance> instance, const char* failure) {
   if (map.insert(instance.get()) == Instance_Map_Base::npos) {

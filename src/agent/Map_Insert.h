@@ -9,6 +9,7 @@
 #include <string>
 #include <utility>
 
+#include "agent/Format_Text.h"
 #include "agent/MapBuild.h"
 
 namespace cimrt {
@@ -30,9 +31,6 @@ auto madeOrNull(Make make) -> decltype(make()) {
     return {};
   }
 }
-
-/// Formats a text as `printf` does.
-std::string formatText(const char* format, ...) __attribute__((format(printf, 1, 2)));
 
 /// Moves `instance` into `map`. False when the map holds a key-equal entry: then `failure` is
 /// logged at `TVX_CRIT` and the instance is gone.

@@ -3,7 +3,7 @@
 #include <algorithm>
 #include <cstring>
 
-#include "agent/Map_Insert.h"
+#include "agent/Format_Text.h"
 #include "common/CLogger.h"
 
 namespace cimrt {
