@@ -10,6 +10,7 @@ namespace {
 using AddCommands = void (*)(CLI::App& app, const CommandChooser& choose);
 
 constexpr AddCommands families[] = {
+    addDiagCommands,
     addPortCommands,
     addSanCommands,
     addFirmwareCommands,

@@ -19,6 +19,7 @@ enum class ExitCode : int {
   MethodResult = 9,
   File = 10,
   Strict = 11,
+  TestFailed = 12,
 };
 
 struct ExitCodeText {
@@ -39,6 +40,7 @@ inline constexpr ExitCodeText exitCodeTexts[] = {
     {ExitCode::MethodResult, "the method ran and its return value is not 0"},
     {ExitCode::File, "a file that was named cannot be read"},
     {ExitCode::Strict, "--strict found an object or memory that leaked"},
+    {ExitCode::TestFailed, "a diagnostic test failed, or left no result"},
 };
 
 /// Ends a command: the message names the thing and, after it, the remedy.

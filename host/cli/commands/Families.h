@@ -5,6 +5,7 @@
 
 namespace tvx::host {
 
+void addDiagCommands(CLI::App& app, const CommandChooser& choose);
 void addLogCommands(CLI::App& app, const CommandChooser& choose);
 void addFirmwareCommands(CLI::App& app, const CommandChooser& choose);
 void addPortCommands(CLI::App& app, const CommandChooser& choose);
