@@ -15,8 +15,8 @@ from pathlib import Path
 
 sys.dont_write_bytecode = True
 
-from generator import (catalogue, class_model, emit_host, emit_methods, emit_module, emit_records, emit_reference,
-                       emit_repository, mof_reader)
+from generator import (catalogue, class_model, emit_host, emit_methods, emit_module, emit_mof, emit_records,
+                       emit_reference, emit_repository, mof_reader)
 from generator.errors import SchemaError
 from generator.writer import Output
 
@@ -31,7 +31,7 @@ def read_schema(folder):
     return classes, rows
 
 
-def generate(classes, served, maps, servings, output):
+def generate(classes, served, maps, servings, version, output):
     order = served + [name for name in classes if name not in set(served)]
     emit_records.records(output, classes)
     emit_records.agent_maps(output, maps)
@@ -41,6 +41,7 @@ def generate(classes, served, maps, servings, output):
     emit_module.factories(output, classes, served)
     emit_module.exports(output, classes, served)
     emit_host.class_data(output, classes, set(served), servings)
+    emit_mof.server_files(output, classes, served, servings, version)
 
 
 def main(words=None):
@@ -49,6 +50,7 @@ def main(words=None):
     parser.add_argument("--schema", type=Path, default=here)
     parser.add_argument("--providers", type=Path, default=here.parent / "derivedObjects" / "providers.txt")
     parser.add_argument("--output", type=Path)
+    parser.add_argument("--product-version", default="0", help="what servers are told of the library")
     parser.add_argument("--check", action="store_true")
     parser.add_argument("--reference", type=Path)
     arguments = parser.parse_args(words)
@@ -64,7 +66,7 @@ def main(words=None):
         if arguments.reference is not None:
             arguments.reference.write_text(page, encoding="utf-8")
         if not arguments.check and arguments.output is not None:
-            generate(classes, served, maps, servings, Output(arguments.output))
+            generate(classes, served, maps, servings, arguments.product_version, Output(arguments.output))
     except SchemaError as error:
         print(error, file=sys.stderr)
         return 1

@@ -240,7 +240,7 @@ class GeneratorTest(unittest.TestCase):
     def test_says_in_the_first_line_what_a_file_is_made_from(self):
         output = self.folder / "out"
         self.assertEqual(self.run_generator("--output", output), (0, ""))
-        files = sorted(output.iterdir())
+        files = sorted(path for path in output.rglob("*") if path.is_file())
         self.assertGreater(len(files), 5)
         for path in files:
             first = path.read_text(encoding="utf-8").splitlines()[0]

@@ -15,7 +15,7 @@ class Output:
         path = self.folder / name
         if path.exists() and path.read_text(encoding="utf-8") == full:
             return
-        self.folder.mkdir(parents=True, exist_ok=True)
+        path.parent.mkdir(parents=True, exist_ok=True)
         path.write_text(full, encoding="utf-8")
 
 
