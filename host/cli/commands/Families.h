@@ -6,6 +6,9 @@
 namespace tvx::host {
 
 void addDiagCommands(CLI::App& app, const CommandChooser& choose);
+void addBootCodeCommands(CLI::App& app, const CommandChooser& choose);
+void addDumpCommands(CLI::App& app, const CommandChooser& choose);
+void addWwnCommands(CLI::App& app, const CommandChooser& choose);
 void addLogCommands(CLI::App& app, const CommandChooser& choose);
 void addFirmwareCommands(CLI::App& app, const CommandChooser& choose);
 void addPortCommands(CLI::App& app, const CommandChooser& choose);
