@@ -10,6 +10,7 @@
 #include "support/Full_Disk.h"
 #include "support/Log_Capture.h"
 #include "support/Loopback_Servers.h"
+#include "support/System_Curl.h"
 #include "support/Working_Folder.h"
 
 namespace cimrt {
@@ -28,6 +29,8 @@ using tvx::test::Working_Folder;
 
 class Transfer : public testing::Test {
  protected:
+  static void SetUpTestSuite() { ASSERT_TRUE(tvx::test::keepSystemCurl()); }
+
   Transfer() {
     for (const char* name : {"http_proxy", "ftp_proxy", "all_proxy", "ALL_PROXY"}) ::unsetenv(name);
     for (std::size_t i = 0; i < 100'000; i++) large += static_cast<char>(i * 7 + i / 251);

@@ -9,6 +9,7 @@
 #include "support/Firmware_File.h"
 #include "support/Full_Disk.h"
 #include "support/Loopback_Servers.h"
+#include "support/System_Curl.h"
 #include "support/Working_Folder.h"
 #include "tvxsim/tvxsim.h"
 
@@ -27,6 +28,8 @@ constexpr const char* HOST = R"({"cards": [
 
 class Firmware : public Provider_Test {
  protected:
+  static void SetUpTestSuite() { ASSERT_TRUE(keepSystemCurl()); }
+
   void SetUp() override {
     Provider_Test::SetUp();
     useScenario(HOST);

@@ -14,6 +14,7 @@
 #include "support/Firmware_File.h"
 #include "support/Full_Disk.h"
 #include "support/Loopback_Servers.h"
+#include "support/System_Curl.h"
 #include "support/Working_Folder.h"
 #include "tvxsim/tvxsim.h"
 
@@ -378,6 +379,7 @@ TEST_F(Installation, APortThatIsNotLocalIsNotTouched) {
 
 class Fetching : public Installation {
  protected:
+  static void SetUpTestSuite() { ASSERT_TRUE(tvx::test::keepSystemCurl()); }
   void SetUp() override {
     Installation::SetUp();
     libcurl() = TVX_SYSTEM_CURL;
