@@ -13,7 +13,7 @@ namespace {
 
 constexpr HBA_STATUS STATUSES[] = {HBA_STATUS_OK, HBA_STATUS_ERROR_MORE_DATA,
                                    HBA_STATUS_ERROR_STALE_DATA, HBA_STATUS_ERROR};
-constexpr std::uint32_t MOST_ROWS = 400;   // more would only cost time
+constexpr std::uint32_t MOST_ROWS = 400;  // more would only cost time
 
 /// What is left of the input.
 struct Input {

@@ -10,17 +10,9 @@ namespace {
 using AddCommands = void (*)(CLI::App& app, const CommandChooser& choose);
 
 constexpr AddCommands families[] = {
-    addDiagCommands,
-    addPortCommands,
-    addSanCommands,
-    addFirmwareCommands,
-    addWwnCommands,
-    addBootCodeCommands,
-    addDumpCommands,
-    addStatsCommands,
-    addLogCommands,
-    addSettingsCommands,
-    addServeCommand,
+    addDiagCommands, addPortCommands,     addSanCommands,  addFirmwareCommands,
+    addWwnCommands,  addBootCodeCommands, addDumpCommands, addStatsCommands,
+    addLogCommands,  addSettingsCommands, addServeCommand,
 };
 
 }  // namespace

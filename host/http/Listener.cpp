@@ -111,8 +111,7 @@ class Listener::Impl {
   void start() {
     sockaddr_storage place{};
     const bool six = fillAddress(place);
-    unsigned flags =
-        MHD_USE_THREAD_PER_CONNECTION | MHD_USE_INTERNAL_POLLING_THREAD | MHD_USE_POLL;
+    unsigned flags = MHD_USE_THREAD_PER_CONNECTION | MHD_USE_INTERNAL_POLLING_THREAD | MHD_USE_POLL;
     if (six) {
       flags |= MHD_USE_IPv6;
     }

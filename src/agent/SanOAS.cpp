@@ -33,7 +33,9 @@ std::string chipTagOf(const TVXHBA_FCPort& port) {
   return {};
 }
 
+/// The chip of that tag, or null; a port that names no chip has none.
 TVXHBA_Chip* findChip(ProviderAgent& agent, const std::string& tag) {
+  if (tag.empty()) return nullptr;
   auto& map = agent.m_TVXHBA_Chip_map;
   for (std::size_t i = 0; i < map.size(); i++) {
     TVX_LOG(TVX_DBG, "Chip Tag: %s", map[i]->Tag.value.c_str());

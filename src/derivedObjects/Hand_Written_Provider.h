@@ -36,8 +36,8 @@
 #pragma once
 
 #include "derivedObjects/Skeleton_Provider.h"
-#include "runtime/Typed_Instance.h"
 #include "generated/Methods.h"
+#include "runtime/Typed_Instance.h"
 
 namespace cimrt {
 

@@ -51,6 +51,10 @@ std::uint32_t setParameter(const char* deviceID, const HBA_WWN& wwpn, bool globa
   return METHOD_LIBRARY_FAILURE + static_cast<std::uint32_t>(status);
 }
 
+bool isMissing(const Property<String>& text) {
+  return text.is_null() || text.value.size() == 0;
+}
+
 /// True if the entry is a unit of that path, which stands in its name as "initiator:target".
 bool isUnitOf(const TVXHBA_DriverParams& entry, const std::string& path) {
   return !entry.paramname.is_null() && entry.paramname.value.equal(OAS_PARAMETER) &&
@@ -64,7 +68,7 @@ bool disableUnit(const TVXHBA_DriverParams& unit, const char* initiator, const c
       TVX_MethodWrapper::SetOASLunState(initiator, initiator, target, fields.lun.c_str(), OAS_OFF,
                                         unit.Option.value) == RM_OK)
     return true;
-  TVX_LOG(TVX_DBG, "Disable OASLunState failed");
+  TVX_LOG(TVX_ERR, "Disable OASLunState failed");
   return false;
 }
 
@@ -112,7 +116,7 @@ std::int32_t TVXHBA_FCHBADriverParamService_Provider::DisableAllOASLuns(
     return_value.set(METHOD_UNKNOWN_SERVICE);
     return INVOKE_METHOD_OK;
   }
-  if (InitiatorWWPN.value.size() == 0 || TargetWWPN.value.size() == 0) {
+  if (isMissing(InitiatorWWPN) || isMissing(TargetWWPN)) {
     TVX_LOG(TVX_ERR, "Invalid Initiator fc port or Target device");
     return_value.set(METHOD_UNKNOWN_PORT);
     return INVOKE_METHOD_OK;

@@ -211,6 +211,8 @@ TEST_F(San_Steps, RemotePortMayHaveNoChip) {
   EXPECT_EQ(findPortTarget(agent, ENTRY).chip, nullptr);
   agent.m_TVXHBA_FCPort_map[0]->IdentifyingDescriptions.set({String("OS Device Name")});
   EXPECT_EQ(findPortTarget(agent, ENTRY).chip, nullptr);
+  agent.m_TVXHBA_Chip_map[0]->Tag.set("");
+  EXPECT_EQ(findPortTarget(agent, ENTRY).chip, nullptr) << "a port that names no chip has none";
 }
 
 TEST_F(San_Steps, EntryWithoutATargetIsTakenAsItIs) {

@@ -186,6 +186,16 @@ TEST_F(Optimized_Access, UnsupportedHardwareIsToldByTheChip) {
   EXPECT_EQ(log.level("RM_GetOASLunList error."), TVX_ERR);
 }
 
+TEST_F(Optimized_Access, StatusOfUnsupportedHardwareIsToldByTheChipToo) {
+  useScenario(hostWith(MARKED));
+  addFault(R"({"call": "LRM_GetOASLunList", "status": 251})");
+  ProviderAgent& ready = startAgent();
+  refresh(ready);
+  agent = &ready;
+  EXPECT_EQ(log.count("GetOASLunList failed. Unsupported Hardware"), 2u);
+  EXPECT_EQ(capability(), 0);
+}
+
 TEST_F(Optimized_Access, LastAnswerDecidesWhatTheChipTells) {
   useScenario(hostWith(MARKED));
   addFault(R"({"call": "LRM_GetOASLunList", "status": 251, "nth": 1})");
@@ -512,7 +522,7 @@ TEST_F(Optimized_Access, UnitsThatStayDoNotStopTheWalkNorTheSuccess) {
   build(MARKED);
   addFault(R"({"call": "LRM_SetOASLunState", "lun": 0, "status": 148})");
   EXPECT_EQ(disableAll(), 0u);
-  EXPECT_EQ(log.level("Disable OASLunState failed"), TVX_DBG);
+  EXPECT_EQ(log.level("Disable OASLunState failed"), TVX_ERR);
   EXPECT_TRUE(unit(unitID("Config", 0)));
   EXPECT_FALSE(unit(unitID("Config", 200)));
   EXPECT_EQ(log.count("DisableAllOASLuns Succeeded"), 1u);
