@@ -1,11 +1,11 @@
 #!/usr/bin/env bash
 # Builds the libFuzzer targets with clang and runs each for a bounded time on its committed corpus.
 #
-# usage: scripts/fuzz.sh [SECONDS_PER_TARGET]   (default 10)
+# usage: scripts/fuzz.sh [SECONDS_PER_TARGET]   (default 5)
 set -euo pipefail
 . "$(dirname "$0")/lib.sh"
 
-seconds=${1:-10}
+seconds=${1:-5}
 configure_and_build fuzz tvx_fuzz_targets
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT

@@ -1,7 +1,8 @@
 #!/usr/bin/env bash
 # clang-format, clang-tidy and cppcheck over hand-written code.
 #
-# usage: scripts/lint.sh [format|tidy|cppcheck]...   (default: all three)
+# usage: scripts/lint.sh [format|tidy|tidy-all|cppcheck]...   (default: format, tidy and cppcheck)
+# tidy looks at the provider (src), tidy-all at the simulator and the host programs too.
 # clang-tidy reads the compile commands of the release build, which scripts/test.sh makes.
 set -euo pipefail
 . "$(dirname "$0")/lib.sh"
@@ -17,9 +18,11 @@ for check in "${checks[@]}"; do
     format)
       clang-format --dry-run --Werror "${sources[@]}"
       echo "format: ${#sources[@]} files" ;;
-    tidy)
+    tidy|tidy-all)
       [ -f build/release/compile_commands.json ] || configure_and_build release
-      mapfile -t units < <(git ls-files 'src/*.cpp' 'host/*.cpp' 'sim/*.cpp')
+      folders=('src/*.cpp')
+      [ "$check" = tidy ] || folders+=('host/*.cpp' 'sim/*.cpp')
+      mapfile -t units < <(git ls-files "${folders[@]}")
       printf '%s\0' "${units[@]}" |
         xargs -0 -n 4 -P "$jobs" clang-tidy -p build/release --quiet 2>/dev/null
       echo "tidy: ${#units[@]} units" ;;

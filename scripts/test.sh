@@ -36,7 +36,7 @@ for stage in "${stages[@]}"; do
       configure_and_build release
       run_ctest release ;;
     asan)
-      step "AddressSanitizer, LeakSanitizer, UndefinedBehaviorSanitizer: all test tiers"
+      step "AddressSanitizer, LeakSanitizer, UndefinedBehaviorSanitizer: the provider and the listener"
       configure_and_build asan
       run_ctest asan ;;
     tsan)

@@ -25,13 +25,14 @@ Select systemsSelect() {
 extern "C" {
 
 /// A wait for nothing but time is over at once.
-int select(int count, fd_set* read, fd_set* write, fd_set* except, timeval* timeout) {
+[[gnu::visibility("default")]] int select(int count, fd_set* read, fd_set* write, fd_set* except,
+                                          timeval* timeout) {
   if (count > 0 || timeout == nullptr) return systemsSelect()(count, read, write, except, timeout);
   sleptMicroseconds += timeout->tv_sec * SECOND + timeout->tv_usec;
   return 0;
 }
 
-int gettimeofday(timeval* time, void* zone) noexcept {
+[[gnu::visibility("default")]] int gettimeofday(timeval* time, void* zone) noexcept {
   timespec now = {};
   clock_gettime(CLOCK_REALTIME, &now);
   const std::int64_t shifted = now.tv_sec * SECOND + now.tv_nsec / 1000 + sleptMicroseconds.load();
