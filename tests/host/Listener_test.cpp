@@ -31,7 +31,7 @@ class ListenerTest : public ::testing::Test {
     result.port = 0;
     result.bodyLimit = 4096;
     result.clientLimit = std::chrono::milliseconds(200);
-    result.connectionLimit = 16;
+    result.connectionLimit = 128;  // those that went away count until they are noticed
     return result;
   }
 
