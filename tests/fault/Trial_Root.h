@@ -5,6 +5,10 @@
 #include <filesystem>
 #include <string>
 
+#ifdef TVX_SYSTEM_CURL
+#include "tests/support/System_Curl.h"
+#endif
+
 namespace tvx::test {
 
 /// While it lives, TVX_ROOT names it. One at a time, made before there are threads.
@@ -18,6 +22,9 @@ class Trial_Root {
       std::filesystem::create_directories(m_Path / folder);
     std::filesystem::copy_file(TVX_MATRIX_FIRMWARE, m_Path / "files/firmware.img");
     setenv("TVX_ROOT", m_Path.c_str(), 1);
+#ifdef TVX_SYSTEM_CURL
+    if (!keepSystemCurl()) std::abort();
+#endif
   }
   ~Trial_Root() { std::filesystem::remove_all(m_Path); }
   Trial_Root(const Trial_Root&) = delete;
