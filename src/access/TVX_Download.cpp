@@ -11,6 +11,8 @@
 #include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
 #include "common/TVX_File.h"
+#include "common/TVX_Uri.h"
+#include "runtime/Safe_Open.h"
 
 namespace cimrt {
 
@@ -130,7 +132,7 @@ bool Fetch::transfer() {
     TVX_LOG(TVX_ERR, "unable to locate function curl_easy_setopt in curl so");
     m_Status.set(FUNCTION_MISSING);
   }
-  TVX_LOG(TVX_DBG, "Sending the URI %s to the Curl library", m_Uri.c_str());
+  TVX_LOG(TVX_DBG, "Sending the URI %s to the Curl library", tvxWithoutPassword(m_Uri).c_str());
   if (setOption == nullptr || !setOptions(setOption)) return false;
   const auto perform = m_Curl.find<Curl_Easy_Perform>("curl_easy_perform");
   if (perform == nullptr) {
@@ -163,7 +165,7 @@ void Fetch::end() {
 /// The file that a fetch fills; null with the reason logged. It is not buffered, so that what does
 /// not fit on the disk fails the transfer and not the silent end of it.
 TVX_File openTarget(const String& path) {
-  TVX_File file = tvxOpenFile(path.c_str(), "wb");
+  TVX_File file(open_for_writing(path.c_str(), "w", LOG_PERMISSIONS));
   if (file) {
     std::setvbuf(file.get(), nullptr, _IONBF, 0);
   } else {
@@ -208,9 +210,11 @@ void fetchFile(TVX_CurlLibrary& curl, const String& uri, String& path, Status& s
 
 String TVX_MethodWrapper::downloadFileUsingCurl(const String& URI, Property<std::uint32_t>& status,
                                                 bool& fetched) {
-  TVX_LOG(TVX_DBG, "TVX_MethodWrapper::downloadFileUsingCurl: %s", URI.c_str());
+  TVX_LOG(TVX_DBG, "TVX_MethodWrapper::downloadFileUsingCurl: %s",
+          tvxWithoutPassword(URI.c_str()).c_str());
   String path = pathOf(URI);
-  TVX_LOG(TVX_DBG, "TVX_MethodWrapper::Firmware file path: %s", path.c_str());
+  TVX_LOG(TVX_DBG, "TVX_MethodWrapper::Firmware file path: %s",
+          tvxWithoutPassword(path.c_str()).c_str());
   if (exists(path.c_str())) {
     TVX_LOG(TVX_ERR, "File found in local file system.");
     return path;

@@ -5,6 +5,7 @@
 
 #include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
+#include "common/TVX_Uri.h"
 
 namespace cimrt {
 
@@ -82,7 +83,7 @@ RM_STATUS TVX_MethodWrapper::tvxcimDownloadFW(const HBA_WWN* wwpn, const char* p
   TVX_LOG(TVX_DBG, "entering the tvxcimDownloadFW function");
   if (!isLocal(wwpn)) return RM_ERROR;
   const char* const file = path != nullptr ? path : "";
-  TVX_LOG(TVX_DBG, "\n firmware file name \"%s\"\n", file);
+  TVX_LOG(TVX_DBG, "\n firmware file name \"%s\"\n", tvxWithoutPassword(file).c_str());
   if (!isThere(file)) return RM_ERROR;
   const RM_STATUS status = flash(*wwpn, file);
   StatusString(status);

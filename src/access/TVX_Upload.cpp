@@ -9,6 +9,7 @@
 #include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
 #include "common/TVX_File.h"
+#include "common/TVX_Uri.h"
 
 namespace cimrt {
 
@@ -100,7 +101,7 @@ int transfer(const TVX_CurlLibrary& curl, void* easy, const String& uri, std::FI
   }
   const long size = sizeOf(file);
   TVX_LOG(TVX_DBG, "iFileSize size:: %ld", size);
-  TVX_LOG(TVX_DBG, "URI.value.c_str(): %s", uri.c_str());
+  TVX_LOG(TVX_DBG, "URI.value.c_str(): %s", tvxWithoutPassword(uri.c_str()).c_str());
   if (!setUploading(setOption, easy) ||
       !check(setOption(easy, CURLOPT_URL, uri.c_str()),
              "Error setting the CURLOPT_URL,error code %d") ||

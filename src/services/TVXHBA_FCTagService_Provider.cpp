@@ -14,6 +14,7 @@
 #include "common/TVX_Clock.h"
 #include "common/TVX_File.h"
 #include "common/TVX_Path.h"
+#include "common/TVX_Uri.h"
 #include "runtime/Safe_Open.h"
 #include "services/Service_Checks.h"
 #include "services/TVX_ConfigTable.h"
@@ -193,8 +194,10 @@ bool writeFile(const std::string& path, const std::string& text) {
          std::fflush(stream.get()) == 0;
 }
 
-void writeTable(const TVX_QoSTable& table, const std::string& path, const std::string& deviceID) {
-  TVX_LOG(TVX_DBG, "GetConfigTable: filename :%s", path.c_str());
+void writeTable(const TVX_QoSTable& table, const char* name, const std::string& deviceID) {
+  const std::string path = outputPath(name);
+  TVX_LOG(TVX_DBG, "GetConfigTable: filename :%s",
+          outputPath(tvxWithoutPassword(name).c_str()).c_str());
   writeFile(path, {});  // the file is there, and empty, whatever becomes of the document
   TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider::WriteConfigTablesToFile");
   const std::string text = writeConfigTable(table, {timeText(), hostName(), deviceID});
@@ -204,7 +207,7 @@ void writeTable(const TVX_QoSTable& table, const std::string& path, const std::s
 /// `writeTable`, with its exceptions logged. True without one.
 bool tryToWriteTable(const TVX_QoSTable& table, const char* name, const std::string& deviceID) {
   try {
-    writeTable(table, outputPath(name), deviceID);
+    writeTable(table, name, deviceID);
     return true;
   } catch (const std::bad_alloc&) {
     TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider: GetConfigTable Memory allocation failed");
@@ -246,7 +249,7 @@ bool isUsableName(const Property<String>& uri) {
   if (staysBelow(uri.value.c_str())) return true;
   TVX_LOG(TVX_ERR,
           "TVXHBA_FCTagService_Provider::GetConfigTable: '%s' leads out of the folder of the table",
-          uri.value.c_str());
+          tvxWithoutPassword(uri.value.c_str()).c_str());
   return false;
 }
 
@@ -319,12 +322,13 @@ void tryToSetFromFile(const char* path, HBA_HANDLE handle, Property<std::uint32_
 void removeFetched(const char* path) {
   struct stat info = {};
   if (::stat(path, &info) != 0) {
-    TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider:: Can't stat file %s", path);
+    TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider:: Can't stat file %s",
+            tvxWithoutPassword(path).c_str());
     return;
   }
   if (std::remove(path) == 0)
     TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider::: FC TAG Config file %s removed successfully",
-            path);
+            tvxWithoutPassword(path).c_str());
 }
 
 void setTable(ProviderAgent& agent, const TVXHBA_FCPort& port, const Property<String>& uri,
@@ -336,7 +340,8 @@ void setTable(ProviderAgent& agent, const TVXHBA_FCPort& port, const Property<St
   }
   bool fetched = false;
   const String path = TVX_MethodWrapper::downloadFileUsingCurl(uri.value, result, fetched);
-  TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider::filename is : %s", path.c_str());
+  TVX_LOG(TVX_DBG, "TVXHBA_FCTagService_Provider::filename is : %s",
+          tvxWithoutPassword(path.c_str()).c_str());
   if (const std::uint32_t refused = checkFile(path.c_str()); refused != METHOD_OK) {
     result.set(refused);
     return;

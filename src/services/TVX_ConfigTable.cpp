@@ -16,6 +16,7 @@
 #include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
 #include "common/TVX_File.h"
+#include "common/TVX_Uri.h"
 #include "services/TVX_XmlShape.h"
 
 namespace cimrt {
@@ -266,7 +267,7 @@ std::string readWholeFile(const char* path) {
     const TVX_File stream = tvxOpenFile(path, "r");
     if (stream && isPlainFile(stream.get()) && readAll(stream.get(), text)) return text;
   }
-  throw std::runtime_error(std::string("cannot open file ") + path);
+  throw std::runtime_error("cannot open file " + tvxWithoutPassword(path));
 }
 
 }  // namespace cimrt

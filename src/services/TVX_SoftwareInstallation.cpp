@@ -10,6 +10,8 @@
 #include "access/TVX_MethodWrapper.h"
 #include "common/CLogger.h"
 #include "common/TVX_File.h"
+#include "common/TVX_Uri.h"
+#include "runtime/Safe_Open.h"
 
 namespace cimrt {
 
@@ -97,9 +99,10 @@ Outcome checkFileAndNames(const Install_Request& request, const char* path,
 void removeFile(const char* path) {
   struct stat info;
   if (::stat(path, &info) != 0) {
-    TVX_LOG(TVX_DBG, "tvxcimDownloadFW: Can't stat file %s", path);
+    TVX_LOG(TVX_DBG, "tvxcimDownloadFW: Can't stat file %s", tvxWithoutPassword(path).c_str());
   } else if (std::remove(path) == 0) {
-    TVX_LOG(TVX_DBG, "tvxcimDownloadFW: FW file %s removed successfully", path);
+    TVX_LOG(TVX_DBG, "tvxcimDownloadFW: FW file %s removed successfully",
+            tvxWithoutPassword(path).c_str());
   }
 }
 
@@ -180,7 +183,7 @@ bool writeAll(std::FILE* file, const Array<std::uint8_t>& image) {
 
 /// Writes the image; what could not be written whole does not stay.
 Outcome writeImage(const char* path, const Array<std::uint8_t>& image) {
-  TVX_File file = tvxOpenFile(path, "wb");
+  TVX_File file(open_for_writing(path, "w", LOG_PERMISSIONS));
   const bool opened = file != nullptr;
   if (opened && writeAll(file.get(), image)) return std::nullopt;
   TVX_LOG(TVX_ERR, "Could not open file to copy the firmware from ByteStream");
@@ -258,7 +261,7 @@ std::uint32_t installFromURI(const Install_Request& request, const Property<Stri
     TVX_LOG(TVX_ERR, "ERROR: CURL returned with Error :%d", static_cast<int>(status.value));
     return INSTALL_FILE_NOT_FOUND;
   }
-  TVX_LOG(TVX_DBG, "filename is : %s", path.c_str());
+  TVX_LOG(TVX_DBG, "filename is : %s", tvxWithoutPassword(path.c_str()).c_str());
   if (const Outcome wrong = checkFileAndNames(request, path.c_str(), target)) return *wrong;
   return installFile(request, target, path.c_str(), fetched);
 }

@@ -1,5 +1,9 @@
 // Methods of the services for boot code and dumps, and the instances of the dump classes.
+#include <algorithm>
+
+#include "../logs/Failing_New.h"
 #include "Service_Test.h"
+#include "agent/ProductSteps.h"
 #include "services/TVXHBA_BootBIOSService_Provider.h"
 #include "services/TVXHBA_DumpData_Provider.h"
 #include "services/TVXHBA_DumpService_Provider.h"
@@ -155,6 +159,51 @@ TEST_F(Dump_Classes, ADirectoryWithoutEndIsBounded) {
   EXPECT_EQ(textOf(data()->DumpDirectory), "/var/dumps" + std::string(246, 'x'));
 }
 
+TEST_F(Dump_Classes, ADirectoryLongerThanTheFieldIsNotRead) {
+  build(R"("dumps": {"directory": "/)" + std::string(300, 'd') + "\"}");
+  refresh(*agent);
+  EXPECT_EQ(textOf(data()->DumpDirectory), "");
+  EXPECT_EQ(log.level("TVX_Dump::tvxcimGetDumpDirectory failed"), TVX_INFO);
+}
+
+TEST_F(Dump_Classes, AFailedBuildIsToldAndTheRefreshGoesOn) {
+  build();
+  Host_Build host{*agent};
+  log.clear();
+  EXPECT_EQ(buildDumpClasses(host), 0);
+  EXPECT_EQ(log.level("FC_CreateDumpClasses failed with status 32769"), TVX_ERR);
+  EXPECT_EQ(log.level("FC_CreateDumpClasses succesful"), TVX_DBG);
+}
+
+TEST_F(Dump_Classes, ALackOfMemoryEndsTheBuild) {
+  build();
+  const auto expectFailure = [this](std::size_t size, int spare, const char* text) {
+    FC_ClearDumpClasses(*agent);
+    log.clear();
+    {
+      const Failing_New failing(size, spare);
+      EXPECT_EQ(FC_CreateDumpClasses(*agent), 40008) << text;
+    }
+    EXPECT_EQ(log.level(text), TVX_CRIT) << text;
+  };
+  // Earlier instances of the same size are spared.
+  const auto sizeOf = [](const Meta_Class& meta) { return static_cast<std::size_t>(meta.size); };
+  const std::size_t sizes[] = {sizeOf(TVXHBA_DumpService::static_meta_class),
+                               sizeOf(TVXHBA_HostedDumpService::static_meta_class),
+                               sizeOf(TVXHBA_DumpServiceAffectsElement::static_meta_class),
+                               sizeOf(TVXHBA_DumpData::static_meta_class),
+                               sizeOf(TVXHBA_ElementDumpData::static_meta_class)};
+  const char* const texts[] = {"Failed to create TVXHBA_DumpService",
+                               "Failed to create TVXHBA_HostedDumpService",
+                               "Failed to create TVXHBA_DumpServiceAffectsElement",
+                               "Failed to create TVXHBA_DumpData for fc port",
+                               "Failed to create TVXHBA_ElementDumpData for fc port"};
+  for (std::size_t i = 0; i < std::size(sizes); i++) {
+    const auto spare = std::count(sizes, sizes + i, sizes[i]);
+    expectFailure(sizes[i], static_cast<int>(spare), texts[i]);
+  }
+}
+
 TEST_F(Dump_Classes, WithoutPortControllersTheServiceStandsAlone) {
   build();
   agent->m_TVXHBA_PortController_map.clear();
@@ -202,6 +251,10 @@ TEST_F(Dump_Classes, AControllerWithoutANameEndsTheBuild) {
   EXPECT_EQ(log.level("TVX_Dump::str2HBAName failed"), TVX_ERR);
   EXPECT_EQ(agent->m_TVXHBA_DumpServiceAffectsElement_map.size(), 1u);
   EXPECT_EQ(agent->m_TVXHBA_DumpData_map.size(), 0u);
+  FC_ClearDumpClasses(*agent);
+  agent->m_TVXHBA_PortController_map[0]->DeviceID.null = 1;
+  EXPECT_EQ(FC_CreateDumpClasses(*agent), 32769);
+  EXPECT_EQ(log.level("TVX_Dump::Id2HBAName failed"), TVX_ERR);
 }
 
 // --- Methods of the dump service -----------------------------------------------------------------

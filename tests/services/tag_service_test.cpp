@@ -4,11 +4,14 @@
 
 #include <atomic>
 #include <cerrno>
+#include <cstdlib>
 #include <fstream>
 #include <new>
+#include <rapidxml/rapidxml.hpp>
 #include <sstream>
 #include <stdexcept>
 
+#include "../logs/Failing_New.h"
 #include "Service_Test.h"
 #include "services/TVXHBA_FCTagService_Provider.h"
 
@@ -195,6 +198,20 @@ TEST_F(Tag_Service, WithoutTheLibraryEveryCallFails) {
   EXPECT_EQ(getTable(port(), "t.xml"), 1u);
 }
 
+TEST_F(Tag_Service, TheNameOfTheLastEntryOfAPortIsTaken) {
+  buildTags(0);
+  const std::string first = textOf(port()->AdapterName);
+  Ref<TVXHBA_FCPort> again(static_cast<TVXHBA_FCPort*>(clone(port())));
+  again->SystemName.set("another system");
+  again->AdapterName.set("no such adapter");
+  agent->m_TVXHBA_FCPort_map.insert(again.release());
+  EXPECT_EQ(getFlag(port()), 32968u);
+  const std::vector<std::string> texts = {
+      "TVXHBA_FCTagService_Provider::Successfully got AdapterName," + first,
+      "TVXHBA_FCTagService_Provider::Successfully got AdapterName,no such adapter"};
+  EXPECT_EQ(log.only(texts), texts);
+}
+
 // --- From the library into a file
 
 TEST_F(Tag_Service, TableIsWrittenIntoTheDumpDirectory) {
@@ -216,6 +233,13 @@ TEST_F(Tag_Service, TableIsWrittenIntoTheDumpDirectory) {
            "TVXHBA_FCTagService_Provider::GetConfigTable Successful"})
     EXPECT_EQ(log.level(line), TVX_DBG) << line;
   EXPECT_EQ(tvxsim_calls("CPQFC_CloseAdapter", nullptr), 1u);
+  const std::string opened =
+      "TVXHBA_FCTagService_Provider::Successfully Opened Adapter, hbaHandle:";
+  std::string handle;
+  for (const Logged& each : log.all())
+    if (each.level == TVX_DBG && each.text.starts_with(opened))
+      handle = each.text.substr(opened.size());
+  EXPECT_GT(std::atoi(handle.c_str()), 0) << handle;
 }
 
 TEST_F(Tag_Service, APortWithoutDumpSettingsUsesTheLastDirectory) {
@@ -400,6 +424,37 @@ TEST_F(Tag_Service, ADocumentThatCannotBeReadShowsInTheLogAlone) {
   EXPECT_EQ(log.level("cannot open file " + root.string()), TVX_DBG);
   EXPECT_EQ(tvxsim_calls("CPQFC_QoSSetConfig", nullptr), 0u);
   EXPECT_EQ(tvxsim_calls("CPQFC_CloseAdapter", nullptr), 3u);
+}
+
+TEST_F(Tag_Service, ALackOfMemoryForTheDocumentIsLogged) {
+  buildTags(1);
+  ASSERT_EQ(getTable(port(), "t.xml"), 0u);
+  {
+    const Failing_New failing(sizeof(rapidxml::xml_document<char>));
+    EXPECT_EQ(setTable((root / "dumps/t.xml").string()), 0u);
+  }
+  EXPECT_EQ(log.level("SetConfigTable: Memory allocation failed"), TVX_DBG);
+  EXPECT_EQ(tvxsim_calls("CPQFC_QoSSetConfig", nullptr), 0u);
+  EXPECT_EQ(tvxsim_calls("CPQFC_CloseAdapter", nullptr), 2u);
+}
+
+TEST_F(Tag_Service, ALibraryThatThrowsIsLogged) {
+  static const TVX_Dl_Operations& system = dlOperations();
+  static int (*const throwing)(
+      HBA_HANDLE, CPQFC_QoSTable*) = [](HBA_HANDLE, CPQFC_QoSTable*) -> int { throw 5; };
+  static const TVX_Dl_Operations hooking = {system.open,
+                                            [](void* handle, const char* name) {
+                                              return std::string(name) == "CPQFC_QoSSetConfig"
+                                                         ? reinterpret_cast<void*>(throwing)
+                                                         : system.symbol(handle, name);
+                                            },
+                                            system.close, system.error};
+  setDlOperations(&hooking);
+  buildTags(1);
+  ASSERT_EQ(getTable(port(), "t.xml"), 0u);
+  EXPECT_EQ(setTable((root / "dumps/t.xml").string()), 0u);
+  EXPECT_EQ(log.level("unknown exectiion is caught"), TVX_DBG);
+  EXPECT_EQ(tvxsim_calls("CPQFC_CloseAdapter", nullptr), 2u);
 }
 
 TEST_F(Tag_Service, AFileThatIsNotThereIsTold) {
