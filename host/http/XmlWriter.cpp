@@ -206,9 +206,9 @@ void XmlWriter::instancePath(const ObjectPath& path, const std::string& nameSpac
 void XmlWriter::property(const std::string& name, const Value& value, const ClassData* classData,
                          bool withClassOrigin) {
   const FeatureData* feature = classData == nullptr ? nullptr : findFeature(*classData, name);
-  const bool untyped = value.type() == CMPI_null && feature != nullptr;
-  const CMPIType type = untyped ? feature->cmpiType : value.elementType();
-  const bool array = untyped ? feature->isArray : value.isArray();
+  const FeatureData* declared = value.type() == CMPI_null ? feature : nullptr;
+  const CMPIType type = declared != nullptr ? declared->cmpiType : value.elementType();
+  const bool array = declared != nullptr ? declared->isArray : value.isArray();
   const char* element = array              ? "PROPERTY.ARRAY"
                         : type == CMPI_ref ? "PROPERTY.REFERENCE"
                                            : "PROPERTY";

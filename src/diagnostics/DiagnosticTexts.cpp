@@ -10,6 +10,10 @@ namespace {
 
 constexpr const char* UNKNOWN = "Unknown";
 
+constexpr const char* TOO_HOT =
+    "Error: HBA temperature exceeded operational range. Adapter stopped.\n\n"
+    "Please see the product documentation";
+
 /// By result code.
 constexpr const char* RESULTS[] = {
     DIAGNOSTIC_SUCCESS,
@@ -23,8 +27,7 @@ constexpr const char* RESULTS[] = {
     "Error: Echo test not supported",
     "Error: Echo Failed",
     "Error: Target Unreachable",
-    "Error: HBA temperature exceeded operational range. Adapter stopped.\n\n"
-    "Please see the product documentation",
+    TOO_HOT,
     "Error: Failed to allocate resource",
     "Error: Another diagnostic test is running. Please try again",
     "Error: Sequence Timeout",

@@ -21,14 +21,15 @@
 
 namespace cimrt {
 
-static_assert(sizeof(CPQFC_QoSEntry) == 36 && offsetof(CPQFC_QoSTable, entry) == 4);
-
 // --- The table -----------------------------------------------------------------------------------
 
 namespace {
 
+constexpr std::size_t FIRST_ENTRY = offsetof(CPQFC_QoSTable, entry);
+static_assert(sizeof(CPQFC_QoSEntry) == 36 && FIRST_ENTRY == 4);
+
 std::size_t entryOffset(std::uint32_t i) {
-  return offsetof(CPQFC_QoSTable, entry) + std::size_t{i} * sizeof(CPQFC_QoSEntry);
+  return FIRST_ENTRY + std::size_t{i} * sizeof(CPQFC_QoSEntry);
 }
 
 }  // namespace

@@ -26,12 +26,16 @@ class Trial_Root {
     if (!keepSystemCurl()) std::abort();
 #endif
   }
-  ~Trial_Root() { std::filesystem::remove_all(m_Path); }
+  ~Trial_Root() {
+    std::filesystem::remove_all(m_Path);
+  }
   Trial_Root(const Trial_Root&) = delete;
   Trial_Root& operator=(const Trial_Root&) = delete;
 
   /// Folder for the files that methods read and write.
-  std::string files() const { return m_Path / "files"; }
+  std::string files() const {
+    return m_Path / "files";
+  }
 
  private:
   std::filesystem::path m_Path;
