@@ -12,7 +12,7 @@ using AddCommands = void (*)(CLI::App& app, const CommandChooser& choose);
 constexpr AddCommands families[] = {
     addDiagCommands, addPortCommands,     addSanCommands,  addFirmwareCommands,
     addWwnCommands,  addBootCodeCommands, addDumpCommands, addStatsCommands,
-    addLogCommands,  addSettingsCommands, addServeCommand,
+    addLogCommands,  addSettingsCommands, addTagCommands,  addServeCommand,
 };
 
 }  // namespace

@@ -65,4 +65,13 @@ std::string localPath(const std::string& fileOrUri) {
   return std::filesystem::absolute(fileOrUri).string();
 }
 
+std::string shownUri(const std::string& fileOrUri) {
+  const std::size_t at = fileOrUri.rfind('@');
+  if (!isRemote(fileOrUri) || at == std::string::npos) {
+    return fileOrUri;
+  }
+  const std::size_t colon = fileOrUri.find(':', fileOrUri.find("://") + 3);
+  return colon < at ? fileOrUri.substr(0, colon + 1) + "***" + fileOrUri.substr(at) : fileOrUri;
+}
+
 }  // namespace tvx::host

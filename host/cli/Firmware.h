@@ -18,4 +18,7 @@ bool isRemote(const std::string& fileOrUri);
 /// The local path that a file URI or a path names, made absolute.
 std::string localPath(const std::string& fileOrUri);
 
+/// A URI as it may be shown: three stars in place of the password, up to the last "@".
+std::string shownUri(const std::string& fileOrUri);
+
 }  // namespace tvx::host

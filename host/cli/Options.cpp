@@ -44,6 +44,11 @@ void addGlobals(CLI::App& app, Options& options, Raw& raw) {
       ->expected(0, 1);
   app.add_flag("--fresh", options.freshSimulation,
                "with --sim: forget what earlier commands changed in this scenario");
+  app.add_option("--preload", options.preloaded,
+                 "library to open for the provider, such as the one for frame tagging")
+      ->type_name("LIBRARY")
+      ->expected(1)
+      ->multi_option_policy(CLI::MultiOptionPolicy::TakeAll);
   app.add_option("--root", options.root, "folder to put before all fixed paths of the provider")
       ->type_name("DIR");
   app.add_option("--namespace", options.nameSpace, "namespace of paths and classes without one")

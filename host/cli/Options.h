@@ -20,6 +20,7 @@ struct Options {
   std::optional<std::string> scenario;  ///< set with --sim; empty for the default one
   bool freshSimulation = false;         ///< forget what earlier runs changed
   std::string root;
+  std::vector<std::string> preloaded;  ///< libraries for the default scope
   std::string nameSpace;
   Format format = Format::Table;
   PropertyList properties;

@@ -1,5 +1,6 @@
 #include "cli/Places.h"
 
+#include <dlfcn.h>
 #include <fmt/format.h>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -146,6 +147,17 @@ void prepareSimulation(const Options& options, const char* const* argv) {
   ::unsetenv(restartMark);
 }
 
+/// Puts the libraries into the default scope of the process, for good.
+void preload(const std::vector<std::string>& libraries) {
+  for (const std::string& each : libraries) {
+    if (::dlopen(each.c_str(), RTLD_NOW | RTLD_GLOBAL) == nullptr) {
+      const char* const reason = ::dlerror();
+      throw CommandError(ExitCode::Library,
+                         fmt::format("--preload: {}", reason == nullptr ? each : reason));
+    }
+  }
+}
+
 }  // namespace
 
 fs::path programFolder() {
@@ -237,6 +249,7 @@ void prepareEnvironment(const Options& options, const char* const* argv) {
   if (options.scenario) {
     prepareSimulation(options, argv);
   }
+  preload(options.preloaded);
 }
 
 }  // namespace tvx::host

@@ -24,7 +24,7 @@ constexpr std::array changing_calls = {
     "RM_GenerateCoreDump", "RM_GenerateDump",    "RM_GenerateEfdDump",  "RM_ResetHBA",
     "RM_RestoreWWN",       "RM_RetrieveFATDump", "RM_RetrieveFATDump2", "RM_SetAdapterAttribute",
     "RM_SetBootBiosState", "RM_SetDriverParam",  "RM_SetDumpDirectory", "RM_SetDumpRetentionCount",
-    "RM_SetOASLunState",   "RM_SetPortEnabled"};
+    "RM_SetOASLunState",   "RM_SetPortEnabled",  "CPQFC_QoSSetConfig",  "CPQFC_QoSSetGlobalFlag"};
 
 // The attributes that calls can change.
 constexpr std::array<std::uint32_t, 4> kept_card_values = {0x210, 0x214, 0x222, 0x24F};

@@ -15,6 +15,7 @@ void addPortCommands(CLI::App& app, const CommandChooser& choose);
 void addSanCommands(CLI::App& app, const CommandChooser& choose);
 void addSettingsCommands(CLI::App& app, const CommandChooser& choose);
 void addStatsCommands(CLI::App& app, const CommandChooser& choose);
+void addTagCommands(CLI::App& app, const CommandChooser& choose);
 void addServeCommand(CLI::App& app, const CommandChooser& choose);
 
 }  // namespace tvx::host

@@ -208,7 +208,7 @@ std::uint64_t install(Session& session, const FirmwareWords& words, const Instan
   const bool terminal = isatty(STDERR_FILENO) != 0;
   const Progress progress(
       session.err(),
-      fmt::format("installing {} on {}{}", words.file, wwnText(port.text("DeviceID")),
+      fmt::format("installing {} on {}{}", shownUri(words.file), wwnText(port.text("DeviceID")),
                   words.reset ? " with a reset" : ""),
       terminal ? terminalStep : logStep, terminal);
   return resultNumber(callMethod(session, service.path, call.method, std::move(call.arguments)));

@@ -23,7 +23,7 @@ struct StatsWords {
 
 /// Keeps the signals that end a program from ending it while it lives, so that the library is
 /// unloaded as it should be: a pause notices them. Threads that start meanwhile leave them alone
-/// too.
+/// too. Once one has come, more of them (timeout(1) sends two) do not end the program either.
 class EndingSignals {
  public:
   EndingSignals() {
@@ -32,23 +32,29 @@ class EndingSignals {
     sigaddset(&m_Signals, SIGTERM);
     pthread_sigmask(SIG_BLOCK, &m_Signals, &m_Before);
   }
-  ~EndingSignals() { pthread_sigmask(SIG_SETMASK, &m_Before, nullptr); }
+  ~EndingSignals() {
+    if (!m_Came) {
+      pthread_sigmask(SIG_SETMASK, &m_Before, nullptr);
+    }
+  }
   EndingSignals(const EndingSignals&) = delete;
   EndingSignals& operator=(const EndingSignals&) = delete;
 
   /// Waits so long. False if a signal came instead.
-  bool pause(double seconds) const {
+  bool pause(double seconds) {
     constexpr double nanosecondsPerSecond = 1e9;
     double whole = 0;
     const double rest = std::modf(seconds, &whole);
     const timespec time = {static_cast<time_t>(whole),
                            static_cast<long>(rest * nanosecondsPerSecond)};
-    return sigtimedwait(&m_Signals, nullptr, &time) < 0;
+    m_Came = sigtimedwait(&m_Signals, nullptr, &time) > 0;
+    return !m_Came;
   }
 
  private:
   sigset_t m_Signals;
   sigset_t m_Before;
+  bool m_Came = false;
 };
 
 void printSample(Session& session, const std::string& wwpn, StatsRates& rates, bool watching) {
@@ -64,7 +70,7 @@ void printSample(Session& session, const std::string& wwpn, StatsRates& rates, b
 
 ExitCode showStats(Session& session, const StatsWords& words) {
   const bool watching = words.watch > 0;
-  const EndingSignals signals;
+  EndingSignals signals;
   const std::string wwpn =
       words.port.empty() ? std::string() : wwnText(findPort(session, words.port).text("DeviceID"));
   StatsRates rates;
