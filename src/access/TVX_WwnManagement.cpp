@@ -137,7 +137,7 @@ std::uint16_t findDuplicate(const New_Names& names) {
 
 bool isUsable(const HBA_WWN& name, const char* what) {
   if (RM_ValidateWwn(name) != RM_ERROR_INVALID_WWN) return true;
-  TVX_LOG(TVX_DBG, "The supplied 'New %s' is not valid", what);
+  TVX_LOG(TVX_ERR, "The supplied 'New %s' is not valid", what);
   return false;
 }
 

@@ -167,11 +167,11 @@ TEST_F(Wwn_Management, AnInvalidNewNameIsRefusedBeforeAnythingIsDone) {
   libraries.provide(RM_ValidateWwn, [&](HBA_WWN wwn) { return wwn.wwn[7] == invalid ? 5 : 0; });
   change();
   EXPECT_EQ(result.value, 40005U);
-  EXPECT_TRUE(capture.has(5, "The supplied 'New WWPN' is not valid"));
+  EXPECT_TRUE(capture.has(3, "The supplied 'New WWPN' is not valid"));
   invalid = 3;
   change();
   EXPECT_EQ(result.value, 40005U);
-  EXPECT_TRUE(capture.has(5, "The supplied 'New WWNN' is not valid"));
+  EXPECT_TRUE(capture.has(3, "The supplied 'New WWNN' is not valid"));
   EXPECT_EQ(calls, 0);
   EXPECT_EQ(operation.value, 65535);
 }

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <fstream>
 #include <string>
@@ -50,6 +51,23 @@ TEST_F(Line_Scan, WhatIsNoRegularFileHasNoLines) {
   const std::string pipe = root.path("/var/log/pipe");
   ASSERT_EQ(::mkfifo(pipe.c_str(), 0600), 0);
   EXPECT_TRUE(tvxLastLinesWith(pipe.c_str(), "tvfc", 9).empty()) << "nobody writes into it";
+}
+
+TEST_F(Line_Scan, AFileThatMayNotBeReadHasNoLines) {
+  root.write("/var/log/messages", "tvfc\n");
+  const std::string path = root.path("/var/log/messages");
+  ASSERT_EQ(::chmod(path.c_str(), 0), 0);
+  constexpr uid_t NOBODY = 65534;
+  const uid_t user = ::geteuid();
+  if (user == 0) {
+    ASSERT_EQ(::seteuid(NOBODY), 0);
+  }
+  const bool isEmpty = scan().empty();
+  const int restored = ::seteuid(user);
+  ASSERT_EQ(restored, 0);
+  EXPECT_TRUE(isEmpty);
+  ASSERT_EQ(::chmod(path.c_str(), 0600), 0);
+  EXPECT_EQ(scan(), Lines{"tvfc"});
 }
 
 TEST_F(Line_Scan, BinaryBytesStayAndZeroBytesGo) {

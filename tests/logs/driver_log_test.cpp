@@ -2,6 +2,7 @@
 #include <filesystem>
 #include <fstream>
 #include <functional>
+#include <sstream>
 
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
@@ -12,6 +13,7 @@
 #include "logs/Driver_Log_Providers.h"
 #include "logs/TVXHBA_DriverLogProfile.h"
 #include "logs/TVXHBA_RecordLog_Provider.h"
+#include "model/TVX_Data.h"
 
 namespace cimrt::test {
 namespace {
@@ -39,6 +41,11 @@ class Driver_Log : public Agent_Test {
                                                              Property<Datetime>{}, result),
               INVOKE_METHOD_OK);
     return result.value;
+  }
+  std::string readText(const std::string& name) const {
+    std::ostringstream text;
+    text << std::ifstream(root / name).rdbuf();
+    return text.str();
   }
   void expectRecords(std::size_t count) {
     Delivered entries;
@@ -134,7 +141,7 @@ TEST_F(Driver_Log, EveryFailureOfTheBuildIsLogged) {
   Ranked_Lock data(agent->m_DataMutex);
   const auto failing = [this] {
     log.clear();
-    EXPECT_EQ(TVXHBA_DriverLogProfile(*agent).CreateFCDriverLogClasses(), MAP_BUILD_FAILED);
+    EXPECT_EQ(TVXHBA_DriverLogProfile(*agent).CreateFCDriverLogClasses(), 0x8001);
     EXPECT_EQ(log.count("Exit CreateFCDriverLogClasses"), 0u);
   };
   agent->m_TVXHBA_RecordLog_map.clear();
@@ -213,6 +220,87 @@ TEST_F(Driver_Log, EnableIsTracedAndShowsInTheLog) {
   EXPECT_EQ(log.count("FC Record Logs enabled"), 0u);
 }
 
+TEST_F(Driver_Log, WithoutAPathItIsEnabledAndTheLoggerStaysAsItIs) {
+  std::filesystem::remove(root / "etc/torvex_fc_provider.dmp");
+  writeFile("var/log/messages", "tvfc one\n");
+  begin();
+  ASSERT_EQ(agent->m_FileLogger.path(), tvxFfdcLogPath());
+  getLogger().disable();
+  log.clear();
+  getLogger().enable();
+  const std::string before = readText("etc/torvex_fc_provider.dmp");
+  EXPECT_EQ(change(2), 0u);
+  EXPECT_EQ(log.level("The tracepath has not been set yet. Until the tracepath is set, FFDC will "
+                      "be used to log messages."),
+            TVX_ERR);
+  EXPECT_EQ(numberOf(driverLog().RequestedState), 2);
+  EXPECT_EQ(numberOf(driverLog().EnabledState), 2);
+  EXPECT_EQ(numbersOf(driverLog().OperationalStatus), (std::vector<std::uint16_t>{2}));
+  EXPECT_EQ(numberOf(driverLog().CurrentNumberOfRecords), 1);
+  expectRecords(1);
+  getLogger().disable();
+  EXPECT_EQ(change(2), 0u);
+  EXPECT_FALSE(getLogger().isEnabled()) << "only the state of the log is enabled";
+  // The driver's log has no part in the logger's configuration.
+  EXPECT_EQ(readText("etc/torvex_fc_provider.dmp"), before);
+  EXPECT_TRUE(agent->m_FileLogger.isRestricted());
+}
+
+TEST_F(Driver_Log, StepsOfItsStatesComeInOrder) {
+  writeFile("var/log/messages", "tvfc one\n");
+  begin();
+  log.clear();
+  EXPECT_EQ(change(2), 0u);
+  EXPECT_EQ(change(3), 0u);
+  getLogger().enable();
+  Property<std::uint32_t> result{};
+  TVXHBA_RecordLog_Provider().ClearLog(&driverLog(), result);
+  const std::vector<std::string> texts = {
+      "Instance of FC Driver Record Log", "Reading Events for tvfc",
+      "Finished reading Events for tvfc", "Logging of FC Driver Log Ends",
+      "Instance of FC Driver Record Log", "Logs disabled"};
+  EXPECT_EQ(log.only({texts[0], texts[1], texts[2], texts[3], texts[5], "FC Record Logs enabled",
+                      "Cleared all the logs"}),
+            texts);
+}
+
+TEST_F(Driver_Log, AdaptersOfAnotherKindAreSkippedAndTheFirstFCOneCounts) {
+  useScenario(R"({"cards": [{"driver_version": "1.1", "ports": [{}]},
+                            {"driver_version": "2.2", "ports": [{}]},
+                            {"driver_version": "3.3", "ports": [{}]}]})");
+  begin();
+  Ranked_Lock data(agent->m_DataMutex);
+  agent->m_TVXHBA_RecordLog_map.clear();
+  agent->m_TVXHBA_EnabledRecordLogCapabilities_map.clear();
+  agent->m_TVXHBA_ProviderUseOfLog_map.clear();
+  Adapter& other = *agent->m_pData->m_Adapters[0];
+  other.m_Type = 2;
+  log.clear();
+  EXPECT_EQ(TVXHBA_DriverLogProfile(*agent).CreateFCDriverLogClasses(), 0);
+  other.m_Type = TVX_ADAPTER_TYPE_FC;
+  const std::string skipped =
+      "Skippping Adapter [" + other.getName() + "] since it is not an FC Adapter";
+  const std::vector<std::string> texts = {"Enter CreateFCDriverLogClasses", skipped,
+                                          "Exit CreateFCDriverLogClasses"};
+  EXPECT_EQ(log.only(texts), texts);
+  EXPECT_EQ(log.level(skipped), TVX_DBG);
+  ASSERT_EQ(agent->m_TVXHBA_ProviderUseOfLog_map.size(), 1u);
+  const auto* driver = static_cast<const TVXHBA_SoftwareIdentity*>(
+      static_cast<const Instance*>(agent->m_TVXHBA_ProviderUseOfLog_map[0]->Dependent));
+  EXPECT_NE(textOf(driver->InstanceID).find("v2.2"), std::string::npos)
+      << textOf(driver->InstanceID);
+}
+
+TEST_F(Driver_Log, WithAdaptersOfAnotherKindAloneThereIsNone) {
+  begin();
+  Ranked_Lock data(agent->m_DataMutex);
+  agent->m_TVXHBA_RecordLog_map.clear();
+  for (Adapter* each : agent->m_pData->m_Adapters) each->m_Type = 2;
+  EXPECT_EQ(TVXHBA_DriverLogProfile(*agent).CreateFCDriverLogClasses(), 0);
+  for (Adapter* each : agent->m_pData->m_Adapters) each->m_Type = TVX_ADAPTER_TYPE_FC;
+  EXPECT_EQ(agent->m_TVXHBA_RecordLog_map.size(), 0u);
+}
+
 TEST_F(Driver_Log, ALineWithTheNameInsideAWordIsKept) {
   writeFile("var/log/messages", "xtvfcx\ntvf c\n\nTVFC\ntvfc");
   begin();
@@ -227,6 +315,39 @@ TEST_F(Driver_Log, WithoutASystemLogItIsEnabledAndEmpty) {
   EXPECT_EQ(numberOf(driverLog().CurrentNumberOfRecords), 0);
   EXPECT_EQ(numberOf(driverLog().EnabledState), 2);
   expectRecords(0);
+}
+
+TEST_F(Driver_Log, ASystemLogThatIsNoFileGivesNoRecords) {
+  std::filesystem::create_directories(root / "var/log/messages");
+  begin();
+  EXPECT_EQ(change(2), 0u);
+  EXPECT_EQ(numberOf(driverLog().EnabledState), 2);
+  expectRecords(0);
+}
+
+TEST_F(Driver_Log, BinaryBytesOfALineAreServed) {
+  writeFile("var/log/messages", std::string("\xff\xfe tvfc \x01\0end\n", 14) + "tvfc at the end");
+  begin();
+  EXPECT_EQ(change(2), 0u);
+  Delivered entries;
+  TVXHBA_FCDriverLogEntry_Provider().enum_instances(nullptr, entries.handler());
+  ASSERT_EQ(entries.size(), 2u);
+  EXPECT_EQ(textOf(entries.at<TVXHBA_FCDriverLogEntry>(0)->RecordData), "tvfc at the end");
+  EXPECT_EQ(textOf(entries.at<TVXHBA_FCDriverLogEntry>(1)->RecordData),
+            "\xff\xfe tvfc \x01"
+            "end");
+}
+
+TEST_F(Driver_Log, AMillionLinesGiveTheNewestTwoHundred) {
+  std::string text;
+  for (int i = 0; i < 1'000'000; i++)
+    text += i % 1000 == 0 ? "tvfc " + std::to_string(i) + "\n" : "x\n";
+  writeFile("var/log/messages", text);
+  begin();
+  EXPECT_EQ(change(2), 0u);
+  expectRecords(200);
+  EXPECT_EQ(agent->m_DeviceLogBuffer.lines().front(), "tvfc 999000");
+  EXPECT_EQ(agent->m_DeviceLogBuffer.lines().back(), "tvfc 800000");
 }
 
 TEST_F(Driver_Log, AnEmptySystemLogGivesNoRecords) {
@@ -329,6 +450,12 @@ TEST_F(Driver_Log, ALackOfMemoryIsLoggedAndDeliversNothing) {
   begin();
   change(2);
   Delivered delivered;
+  {
+    const Failing_New failing(TVXHBA_FCDriverLogEntry::static_meta_class.size);
+    Ranked_Lock data(agent->m_DataMutex);
+    EXPECT_EQ(CreateFCDriverLogEntryClass(*agent), 0x8000);
+    EXPECT_EQ(log.count("CreateFCDriverLogEntryClass Successful"), 0u);
+  }
   {
     const Failing_New failing(TVXHBA_FCDriverLogEntry::static_meta_class.size, 1);
     TVXHBA_FCDriverLogEntry_Provider().enum_instances(nullptr, delivered.handler());

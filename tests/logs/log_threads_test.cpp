@@ -1,7 +1,9 @@
 // The record log under many threads: what each test says holds in any build; under ThreadSanitizer
 // it also shows that nothing is touched without its lock.
 #include <atomic>
+#include <cstdio>
 #include <filesystem>
+#include <map>
 #include <thread>
 #include <vector>
 
@@ -95,6 +97,29 @@ TEST_F(Log_Threads, TheRingIsReadAndClearedWhileItTurns) {
     require(result.value == 0);
   }
   finish();
+}
+
+TEST_F(Log_Threads, TheRingKeepsTheNewestWholeRecordsOfEveryThread) {
+  startLogging(4);
+  while (agent->m_CIMLogger.lastIndex() < 3 * 1024) std::this_thread::yield();
+  finish();
+  const std::vector<TVX_CIMLogger::Record> records = agent->m_CIMLogger.records();
+  ASSERT_EQ(records.size(), 1024u);
+  // From the oldest to the newest each thread's lines follow each other without a gap.
+  const auto oldest = static_cast<std::size_t>(agent->m_CIMLogger.lastIndex() + 1) % 1024;
+  std::map<int, int> last;
+  for (std::size_t i = 0; i < records.size(); i++) {
+    int line = -1;
+    int thread = -1;
+    char end = 0;
+    const char* text = records[(oldest + i) % 1024].text;
+    ASSERT_EQ(std::sscanf(text, "[line %d of thread %d%c", &line, &thread, &end), 3) << text;
+    EXPECT_EQ(end, ']') << text;
+    if (last.count(thread) != 0) {
+      EXPECT_EQ(line, last[thread] + 1) << text;
+    }
+    last[thread] = line;
+  }
 }
 
 TEST_F(Log_Threads, TheLoggerIsSetWhileOthersLogThroughIt) {

@@ -223,8 +223,10 @@ TEST_F(Record_Log_Methods, TheDriversLogHasNoParameters) {
   EXPECT_EQ(TVXHBA_RecordLog_Provider().SetLogParams(&driverLog(), valueOf<std::uint16_t>(1),
                                                      valueOf<std::uint16_t>(1), valueOf(String("")),
                                                      result),
-            INVOKE_METHOD_UNSUPPORTED);
+            0x83);
   EXPECT_TRUE(result.is_null());
+  // It is told before anything else is looked at.
+  EXPECT_EQ(log.count("Invalid instance of Record Log"), 0u);
   EXPECT_EQ(log.level("SetLogParams is not supported for Driver Record Log Instance"), TVX_CRIT);
   expectUnchanged();
 }
@@ -247,6 +249,43 @@ TEST_F(Record_Log_Methods, AnUnknownLogIsRefusedByAll) {
     EXPECT_EQ(log.level("Invalid instance of Record Log"), TVX_ERR);
   }
   expectUnchanged();
+}
+
+TEST_F(Record_Log_Methods, ParametersAreLookedAtInOrder) {
+  begin();
+  const auto refused = [this](int level, int mode, const std::string& text) {
+    log.clear();
+    EXPECT_EQ(setParams(level, mode, ""), 0x80C8u);
+    EXPECT_EQ(log.only({"Log level provided is out of range", "Log mode provided is out of range",
+                        "Setting the trace path failed"}),
+              std::vector<std::string>{text});
+  };
+  refused(9, 9, "Log level provided is out of range");
+  refused(5, 9, "Log mode provided is out of range");
+  refused(5, 2, "Setting the trace path failed");
+  // What is checked first is whether there is such a log.
+  const Ref<TVXHBA_RecordLog> other = unknownLog();
+  Property<std::uint32_t> result{};
+  log.clear();
+  TVXHBA_RecordLog_Provider().SetLogParams(other.get(), valueOf<std::uint16_t>(9),
+                                           valueOf<std::uint16_t>(9), valueOf(String("")), result);
+  EXPECT_EQ(result.value, 0x812Cu);
+  EXPECT_EQ(log.count("Log level provided is out of range"), 0u);
+}
+
+TEST_F(Record_Log_Methods, StepsOfAChangeComeInOrder) {
+  begin();
+  const std::string path = file("var/log/trace.log");
+  log.clear();
+  ASSERT_EQ(setParams(5, 4, path), 0u);
+  const std::vector<std::string> texts = {"Changing the record log parameters 5-4-" + path,
+                                          "Setting path as " + path};
+  EXPECT_EQ(log.only(texts), texts);
+  // Level and mode hold when the entry is told of, and the file has that line as its second.
+  const std::string lines = contents("var/log/trace.log");
+  EXPECT_EQ(lines.find("Changing the record log parameters"), std::string::npos)
+      << "the mode was another by then";
+  EXPECT_NE(lines.find("][TVX_DBG] Setting path as " + path + "\n"), std::string::npos);
 }
 
 // --- RequestStateChange

@@ -1,9 +1,11 @@
 // Logs and settings as a client sees them.
 #include <filesystem>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "Provider_Fixture.h"
+#include "tvxsim/tvxsim.h"
 
 namespace tvx::test {
 namespace {
@@ -35,6 +37,16 @@ class Logs : public Provider_Test {
   }
   static host::NamedValues state(std::uint64_t value) {
     return {{"RequestedState", host::Value::number(CMPI_uint16, value)}};
+  }
+  int change(const std::string& name, std::uint64_t value) {
+    host::Instance setting;
+    setting.path.nameSpace = "root/torvex";
+    setting.path.className = "TVXHBA_ProviderConfigSetting";
+    const auto id = host::Value::string("Torvex HBA Provider:" + name);
+    setting.path.keys.set("InstanceID", id);
+    setting.properties.set("InstanceID", id);
+    setting.properties.set("current", host::Value::number(CMPI_uint32, value));
+    return broker->modifyInstance(setting, {{"current"}}).status.rc;
   }
   static host::NamedValues params(std::uint64_t level, std::uint64_t mode,
                                   const std::string& path) {
@@ -118,17 +130,34 @@ TEST_F(Logs, TheDriversLinesAreReadByAnEnable) {
   EXPECT_EQ(driverLog().property("CurrentNumberOfRecords").asUnsigned(), 0u);
 }
 
+TEST_F(Logs, ParametersAndStatesSurviveAReload) {
+  const std::string path = (root / "var/log/trace.log").string();
+  ASSERT_EQ(call(providerLog(), "SetLogParams", params(2, 4, path)).returnValue.asUnsigned(), 0u);
+  ASSERT_EQ(call(providerLog(), "RequestStateChange", state(3)).returnValue.asUnsigned(), 0u);
+  unload();
+  load();
+  const host::Instance record = providerLog();
+  EXPECT_EQ(record.text("TracePath"), path);
+  EXPECT_EQ(record.property("LogLevel").asUnsigned(), 2u);
+  EXPECT_EQ(record.property("LogMode").asUnsigned(), 4u);
+  EXPECT_EQ(record.property("EnabledState").asUnsigned(), 3u);
+}
+
+TEST_F(Logs, AChangeDuringARefreshWaitsAndThenHolds) {
+  addFault(R"({"call": "LRM_GetDumpRetentionCount", "delay_ms": 30})");
+  ASSERT_EQ(tvxsim_calls("LRM_GetDumpRetentionCount", nullptr), 0u);
+  std::thread reader([this] { EXPECT_FALSE(instances("TVXHBA_Card").empty()); });
+  // The maps are being built, and are about to be done with the first port.
+  while (tvxsim_calls("LRM_GetDumpRetentionCount", nullptr) == 0) std::this_thread::yield();
+  EXPECT_EQ(change("cachetimeout", 12), CMPI_RC_OK);
+  const unsigned long built = tvxsim_calls("LRM_GetDumpRetentionCount", nullptr);
+  reader.join();
+  EXPECT_EQ(built, instances("TVXHBA_PortController").size()) << "it did not wait for the end";
+  const host::Instance setting = instances("TVXHBA_ProviderConfigSetting").at(0);
+  EXPECT_EQ(setting.property("current").asUnsigned(), 12u);
+}
+
 TEST_F(Logs, SettingsAreChangedWithinTheirRange) {
-  const auto change = [this](const std::string& name, std::uint64_t value) {
-    host::Instance setting;
-    setting.path.nameSpace = "root/torvex";
-    setting.path.className = "TVXHBA_ProviderConfigSetting";
-    const auto id = host::Value::string("Torvex HBA Provider:" + name);
-    setting.path.keys.set("InstanceID", id);
-    setting.properties.set("InstanceID", id);
-    setting.properties.set("current", host::Value::number(CMPI_uint32, value));
-    return broker->modifyInstance(setting, {{"current"}}).status.rc;
-  };
   EXPECT_EQ(change("cachetimeout", 30), CMPI_RC_OK);
   EXPECT_EQ(change("cachetimeout", 31), CMPI_RC_ERR_INVALID_PARAMETER);
   EXPECT_EQ(change("adapterrefresh", 2), CMPI_RC_ERR_INVALID_PARAMETER);
