@@ -1,5 +1,7 @@
 #include "cmpi/Converter.h"
 
+#include <new>
+
 #include "cmpi/CMPI_Containers.h"
 #include "cmpi/CMPI_Object.h"
 #include "runtime/Log.h"
@@ -16,13 +18,23 @@ const Meta_Repository* repository_of(const Instance* instance) {
   return meta_class ? meta_class->meta_repository : nullptr;
 }
 
+/// Converts into a new instance; null if there is no memory for it.
+Ref<Instance> convert(Container& container, const Meta_Record* record, std::uint32_t flags) {
+  try {
+    Instance* instance = nullptr;
+    const int code = container.convert(record, flags, instance);
+    Ref<Instance> made(instance);
+    return code == 0 ? made : Ref<Instance>();
+  } catch (const std::bad_alloc&) {
+    return {};
+  }
+}
+
 /// Reads a container into a new instance and gives it the namespace of `path`.
 int read(Container& container, const Meta_Record* record, std::uint32_t flags,
          const char* name_space, Instance*& out) {
-  Instance* instance = nullptr;
-  const int code = container.convert(record, flags, instance);
-  Ref<Instance> made(instance);
-  if (code != 0 || !made) return CONVERSION_FAILED;
+  Ref<Instance> made = convert(container, record, flags);
+  if (!made) return CONVERSION_FAILED;
   set_name_space(made.get(), name_space, false);
   out = made.release();
   return 0;

@@ -4,6 +4,7 @@
 #include <stdexcept>
 
 #include "Faulty_Broker.h"
+#include "Refused_Allocation.h"
 #include "Test_Instances.h"
 #include "Test_Server.h"
 #include "Trace_Log.h"
@@ -256,6 +257,37 @@ TEST_F(Method_Operations, AnUnknownArgumentIsLogged) {
   Trace_Log log;
   expect_record({{"Colour", Any::string("red")}}, [](const Instance*) {});
   EXPECT_TRUE(log.has("WARN", "unknown feature: Run.Colour"));
+}
+
+TEST_F(Method_Operations, AnArgumentThatCannotBeReadIsLogged) {
+  Trace_Log log;
+  expect_record({{"IPart", Any::reference(path_of("TEST_Unknown", "r"))}},
+                [](const Instance* record) { EXPECT_TRUE(null_in(record, "IPart")); });
+  EXPECT_THAT(log.texts("WARN"),
+              ElementsAre("failed to find meta class: TEST_Unknown", "cmpi_to_cimrt_value() failed",
+                          "unexpected failure: Run.IPart"));
+}
+
+TEST_F(Method_Operations, WithoutMemoryTheCallFailsAndTheLogTellsWhatCouldNotBeMade) {
+  const struct {
+    const Meta_Record* record;
+    const char* detail;
+  } rows[] = {{classes.all, "CIMRT reference creation failed"},
+              {classes.run, "CIMRT make_cimrt_method function failed"}};
+  server.broker.interface("TEST_All", tvx::host::InterfaceKind::Method);
+  for (const auto& row : rows) {
+    Trace_Log log;
+    {
+      const Refused_Allocation refused(row.record->size);
+      const Reply reply = run({{"Iuint32", Any::number(CMPI_uint32, 5)}});
+      EXPECT_EQ(reply.status.rc, CMPI_RC_ERR_FAILED);
+      EXPECT_FALSE(reply.done);
+      EXPECT_FALSE(reply.report.leaks()) << reply.report.text();
+    }
+    EXPECT_TRUE(
+        log.has("DBG", std::string("return: invokeMethod(): CMPI_RC_ERR_FAILED ") + row.detail));
+  }
+  EXPECT_EQ(script.count(OPERATION_INVOKE_METHOD), 0u);
 }
 
 // ---- References and embedded instances

@@ -1,5 +1,6 @@
 // Up-calls of providers, with and without a context, and threads that providers start.
 #include <gmock/gmock.h>
+#include <unistd.h>
 
 #include <thread>
 
@@ -86,10 +87,11 @@ TEST_F(Up_Calls, AContextOfAnotherThreadIsNoContext) {
 
 TEST_F(Up_Calls, TheListFormIsNotAvailable) {
   const auto call = [this] {
+    dup2(STDERR_FILENO, STDOUT_FILENO);  // what is printed is looked at as well
     alignas(Array_Base) unsigned char place[sizeof(Array_Base)] = {};
     cimom::enum_instances(NS, part("one").get(), reinterpret_cast<Array<Instance>&>(place));
   };
-  EXPECT_DEATH(call(), "assert: false");
+  EXPECT_DEATH(call(), "NOT IMPLEMENTED\\.\n(.*\n)*.*assert: false");
 }
 
 // ---- Instances

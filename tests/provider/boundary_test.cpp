@@ -111,6 +111,32 @@ TEST_F(Boundary, AClassLetsOneRequestInAtATime) {
   EXPECT_TRUE(done);
 }
 
+/// Hands a class's interface a path of a class that the library does not know.
+int enumerateUnknownClass(host::Broker& broker, const std::string& className, bool names) {
+  host::Core& core = host::Core::of(broker.face());
+  auto* face =
+      static_cast<CMPIInstanceMI*>(broker.interface(className, host::InterfaceKind::Instance));
+  host::Scope scope(core, "unknown");
+  const host::ScopeGuard guard(scope);
+  Reply reply;
+  const CMPIResult* result = host::makeResult(core, reply);
+  const CMPIContext* context = host::makeContext(core, {}, host::Origin::HandedOut);
+  const CMPIObjectPath* path =
+      host::makePath(core, {"", "root/torvex", "No_Such_Class", {}}, host::Origin::HandedOut);
+  const CMPIStatus status =
+      names ? face->ft->enumerateInstanceNames(face, context, result, path)
+            : face->ft->enumerateInstances(face, context, result, path, nullptr);
+  EXPECT_FALSE(reply.done) << className;
+  EXPECT_EQ(status.msg, nullptr) << className;
+  return status.rc;
+}
+
+TEST_F(Boundary, AnUnknownClassFailsInEveryInterface) {
+  for (const std::string& name : servedClasses())
+    for (const bool names : {false, true})
+      EXPECT_EQ(enumerateUnknownClass(*broker, name, names), CMPI_RC_ERR_FAILED) << name;
+}
+
 /// Runs a request again and again, with the first, the second... of the library's allocations
 /// failing, until it gets by without one.
 void failEveryAllocation(const std::function<Reply()>& request) {

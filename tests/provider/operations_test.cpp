@@ -259,9 +259,10 @@ TEST_F(Operations, AKeyOfAnotherTypeFindsNothing) {
     const std::vector<Instance> all = instances(each->name);
     if (all.empty()) continue;
     for (const host::NamedValue& key : all.front().path.keys) {
-      for (const Value& wrong : {Value::boolean(true), Value::dateTime("20240229235959.123456+060"),
-                                 Value::real(CMPI_real64, 1.5), Value::null(CMPI_string),
-                                 Value::number(CMPI_uint8, 1), Value::stringWithoutText()}) {
+      for (const Value& wrong :
+           {Value::boolean(true), Value::dateTime("20240229235959.123456+060"),
+            Value::real(CMPI_real64, 1.5), Value::null(CMPI_string), Value::number(CMPI_uint64, 1),
+            Value::signedNumber(CMPI_sint64, 1), Value::stringWithoutText()}) {
         ObjectPath path = all.front().path;
         path.keys.set(key.name, wrong);
         EXPECT_EQ(code(broker->getInstance(path), each->name), CMPI_RC_ERR_NOT_FOUND)

@@ -15,6 +15,7 @@
 
 #include "Child_Process.h"
 #include "Provider_Fixture.h"
+#include "tvxsim/tvxsim.h"
 
 namespace tvx::test {
 namespace {
@@ -112,6 +113,59 @@ TEST_F(Server_Behaviours, KeysAreFoundInEveryFormThatServersGiveThem) {
   }
 }
 
+TEST_F(Server_Behaviours, NoKeyIsANumberThatAServerCouldWiden) {
+  // Every form of integer keys is the same to these classes; the bridge's own tests narrow them.
+  for (std::size_t i = 0; i < host::allClassCount; ++i)
+    for (const host::FeatureData& feature : host::features(host::allClasses[i])) {
+      if (!feature.isKey) continue;
+      EXPECT_TRUE(feature.cmpiType == CMPI_string || feature.cmpiType == CMPI_ref)
+          << host::allClasses[i].name << "." << feature.name;
+    }
+}
+
+TEST_F(Server_Behaviours, NumbersWrittenAsTextsAreReadByTheParametersType) {
+  load();
+  const ObjectPath log = [&] {
+    for (const ObjectPath& each : broker->enumerateInstanceNames("TVXHBA_RecordLog").paths)
+      if (each.key("InstanceID").asText().starts_with("TVXHBA:ProviderLog:")) return each;
+    return ObjectPath{};
+  }();
+  const std::string file = (root / "opt/ibm/platform/log/told.log").string();
+  const auto set = [&](const Value& level, const Value& mode) {
+    const Reply reply = broker->invokeMethod(
+        log, "SetLogParams",
+        {{"LogLevel", level}, {"LogMode", mode}, {"TracePath", Value::string(file)}});
+    EXPECT_EQ(reply.status.rc, CMPI_RC_OK);
+    EXPECT_FALSE(reply.report.leaks()) << reply.report.text();
+    return reply.returnValue.asUnsigned();
+  };
+  EXPECT_EQ(set(Value::string("4"), Value::string("2")), 0U);
+  const Reply shown = broker->getInstance(log);
+  ASSERT_EQ(shown.instances.size(), 1U);
+  EXPECT_EQ(shown.instances[0].property("LogLevel").asUnsigned(), 4U);
+  EXPECT_EQ(shown.instances[0].property("LogMode").asUnsigned(), 2U);
+  // A number of another width is no value for the parameter, which stays empty.
+  EXPECT_EQ(set(Value::number(CMPI_uint64, 4), Value::number(CMPI_uint16, 2)), 0x80C8U);
+}
+
+TEST_F(Server_Behaviours, AMethodThatRanAnswersAValueOfAType) {
+  // There are servers that end when they are handed a value without a type.
+  load();
+  std::size_t answered = 0;
+  for (const std::string& name : servedClasses()) {
+    const Reply names = broker->enumerateInstanceNames(name);
+    if (names.paths.empty()) continue;
+    for (const host::MethodData& method : host::methods(*classes->find(name))) {
+      const Reply reply = broker->invokeMethod(names.paths.front(), method.name);
+      if (reply.status.rc != CMPI_RC_OK) continue;
+      EXPECT_NE(reply.returnValue.type(), CMPI_null) << name << "." << method.name;
+      EXPECT_NE(method.returnType, CMPI_ref) << name << "." << method.name;
+      ++answered;
+    }
+  }
+  EXPECT_GT(answered, 10U);
+}
+
 TEST_F(Server_Behaviours, APathWithoutNamespaceIsServed) {
   load();
   const auto expected = census();
@@ -197,6 +251,44 @@ TEST_F(Server_Behaviours, CleanupOnAnotherThreadWhileRequestsRunAndTheProcessEnd
               leaveBroker();
             }),
             0);
+}
+
+/// What the library is doing while the server ends.
+struct Moment {
+  const char* call;  ///< of the management libraries
+  const char* asks;  ///< the class that a client enumerates
+};
+
+TEST_F(Server_Behaviours, AServerMayTerminateAtAnyMoment) {
+  const Moment moments[] = {{"LRM_InitLib", "TVXHBA_FCPort"},
+                            {"LRM_GetServerAttributes", "TVXHBA_Card"},
+                            {"HBA_GetNumberOfAdapters", "TVXHBA_Card"},
+                            {"LRM_GetHBAAttributes", "TVXHBA_FCPort"},
+                            {"HBA_OpenAdapter", "TVXHBA_StorageVolume"},
+                            {"HBA_GetFcpTargetMapping", "TVXHBA_StorageVolume"},
+                            {"HBA_SendScsiInquiry", "TVXHBA_StorageVolume"},
+                            {"HBA_SendReadCapacity", "TVXHBA_StorageVolume"},
+                            {"LRM_GetPortStatistics", "TVXHBA_FCPortStatistics"}};
+  for (const Moment& moment : moments) {
+    useScenario();
+    addFault(std::string(R"({"call": ")") + moment.call + R"(", "first": 1, "delay_ms": 15})");
+    load();
+    std::atomic<int> code{-1};
+    std::thread client([&] {
+      const Reply reply = broker->enumerateInstances(moment.asks);
+      EXPECT_FALSE(reply.report.leaks()) << moment.call << reply.report.text();
+      code = reply.status.rc;
+    });
+    while (tvxsim_calls(moment.call, nullptr) == 0 && code == -1) std::this_thread::yield();
+    EXPECT_GT(tvxsim_calls(moment.call, nullptr), 0U) << moment.call << " is not reached";
+    EXPECT_EQ(broker->cleanup(moment.asks, host::InterfaceKind::Instance, true).rc, CMPI_RC_OK)
+        << moment.call;
+    client.join();
+    // A request that comes after the unloading of its class is refused.
+    EXPECT_TRUE(code == CMPI_RC_OK || code == CMPI_RC_ERR_FAILED) << moment.call << " " << code;
+    unload();
+    EXPECT_EQ(tvxsim_open_handles(), 0U) << moment.call;
+  }
 }
 
 // ---- What a server's process is like
