@@ -162,6 +162,12 @@ void Fetch::end() {
   globalCleanup();
 }
 
+/// True for a file, or a link to one, that is there under the name.
+bool isFileOrLink(const char* path) {
+  struct stat info;
+  return ::lstat(path, &info) == 0 && (S_ISREG(info.st_mode) || S_ISLNK(info.st_mode));
+}
+
 /// The file that a fetch fills; null with the reason logged. It is not buffered, so that what does
 /// not fit on the disk fails the transfer and not the silent end of it.
 TVX_File openTarget(const String& path) {
@@ -191,11 +197,15 @@ void closeCurl(TVX_CurlLibrary& curl) {
   }
 }
 
-/// Fetches into the file `path`, which becomes the URI again if libcurl can't read that.
+/// Fetches into the file `path`, which becomes the URI again if libcurl can't read that, and if
+/// somebody else's file has the name: the caller must not take that one for what was fetched.
 void fetchFile(TVX_CurlLibrary& curl, const String& uri, String& path, Status& status,
                bool& fetched) {
   const TVX_File file = openTarget(path);
-  if (!file) return;
+  if (!file) {
+    if (isFileOrLink(path.c_str())) path = uri;
+    return;
+  }
   TVX_LOG(TVX_DBG, "OPENED the curl library to download from internet");
   curl.tellVersion();
   Fetch fetch(curl, uri, file.get(), status);

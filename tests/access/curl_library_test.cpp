@@ -98,10 +98,10 @@ TEST_F(Transfer, KeepsNothingOpen) {
     EXPECT_EQ(TVX_MethodWrapper::uploadFileUsingCurl(String("http://127.0.0.1:1/up"), "image.fw"),
               -1);
   }
-  // The server's own ends close when its thread comes to it.
+  // The server's own ends close when its thread comes to it; one may have been open before, too.
   for (int i = 0; i < 200 && openDescriptors() > before; i++)
     std::this_thread::sleep_for(std::chrono::milliseconds(10));
-  EXPECT_EQ(openDescriptors(), before);
+  EXPECT_LE(openDescriptors(), before);
 }
 
 TEST_F(Transfer, WhatTheServerAnswersIsTheFile) {

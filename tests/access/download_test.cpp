@@ -158,6 +158,21 @@ TEST_F(Download, AUriWithoutASlashHasNoFileName) {
   EXPECT_THAT(folder.files(), IsEmpty());
 }
 
+TEST_F(Download, SomebodyElsesFileOfThatNameIsNotTakenForIt) {
+  const std::string elsewhere = folder.path("elsewhere");
+  std::filesystem::create_directory(elsewhere);
+  folder.write("elsewhere/target", "another's");
+  std::filesystem::permissions(folder.path("."),
+                               std::filesystem::perms::all | std::filesystem::perms::sticky_bit);
+  std::filesystem::create_symlink(elsewhere + "/target", folder.path("image.fw"));
+  EXPECT_EQ(download(), URI);
+  EXPECT_TRUE(capture.has(3, "ERROR: Could not open the file for writing"));
+  EXPECT_TRUE(status.is_null());
+  EXPECT_FALSE(fetched);
+  EXPECT_FALSE(called("curl_easy_perform"));
+  EXPECT_EQ(folder.read("elsewhere/target"), "another's");
+}
+
 TEST_F(Download, AFileThatCannotBeWrittenEndsIt) {
   const std::size_t before = openDescriptors();
   for (const std::string name : {"", ".", ".."}) {

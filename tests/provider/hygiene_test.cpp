@@ -1,6 +1,7 @@
 // What the library leaves on the machine: no file that everybody may write, no password in a log.
 #include <dlfcn.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <atomic>
@@ -17,6 +18,7 @@
 #include "support/Loopback_Servers.h"
 #include "support/System_Curl.h"
 #include "support/Working_Folder.h"
+#include "tvxsim/tvxsim.h"
 
 namespace tvx::test {
 namespace {
@@ -168,8 +170,33 @@ TEST_F(Hygiene, LinksInSharedFoldersAreNotFollowed) {
   fs::create_symlink(root / "absent", folder.path("stream.fw"));
   EXPECT_EQ(installBytes("x", folder.path("new.fw")), 4u);
   EXPECT_EQ(installBytes("x", folder.path("stream.fw")), 4u);
+  fs::permissions(root / "dumps", fs::perms::all | fs::perms::sticky_bit);
+  fs::create_symlink(root / "precious", root / "dumps/table.xml");
+  fs::create_symlink(root / "absent", root / "dumps/new.xml");
+  EXPECT_EQ(table("GetConfigTable", "table.xml"), 0u);
+  EXPECT_EQ(table("GetConfigTable", "new.xml"), 0u);
   EXPECT_FALSE(fs::exists(root / "absent"));
-  EXPECT_NE(textsBelow(root).find("precious"), std::string::npos);
+  std::string content;
+  std::getline(std::ifstream(root / "precious"), content);
+  EXPECT_EQ(content, "precious");
+}
+
+TEST_F(Hygiene, SomebodyElsesFileIsNotInstalledInPlaceOfTheFetchedOne) {
+  load();
+  Http_Server server;
+  server.put("new.fw", firmwareImage("2.02a2", "TVX16"));
+  fs::permissions(folder.path("."), fs::perms::all | fs::perms::sticky_bit);
+  std::ofstream(root / "planted") << firmwareImage("6.66a6", "TVX16");
+  fs::create_symlink(root / "planted", folder.path("new.fw"));
+  EXPECT_EQ(installURI(server.url("new.fw")), 4107u);
+  fs::remove(folder.path("new.fw"));
+  fs::copy_file(root / "planted", folder.path("new.fw"));
+  ASSERT_EQ(::chown(folder.path("new.fw").c_str(), 65534, 65534), ::geteuid() == 0 ? 0 : -1);
+  if (::geteuid() == 0) {
+    EXPECT_EQ(installURI(server.url("new.fw")), 4107u);
+  }
+  EXPECT_TRUE(server.requests().empty());
+  EXPECT_EQ(tvxsim_calls("RM_DownloadFirmware", nullptr), 0u);
 }
 
 TEST_F(Hygiene, PasswordsInURIsAreNotLogged) {
