@@ -4,6 +4,7 @@
 
 #include "Simulated_Program.h"
 #include "support/Firmware_File.h"
+#include "support/Loopback_Servers.h"
 
 namespace tvx::host {
 namespace {
@@ -77,6 +78,43 @@ TEST_F(FirmwareProgramTest, TellsAFailureInWordsWithItsNumber) {
   EXPECT_EQ(result.exitCode, 9);
   EXPECT_EQ(result.out, std::string(port) + ": the firmware file is not available (4107)\n");
   EXPECT_EQ(leftFolders(), 0U);
+}
+
+/// Installs from a server, over a disk of so many KiB that only this process has.
+class FirmwareOnADiskTest : public FirmwareProgramTest {
+ protected:
+  FirmwareOnADiskTest() : m_Disk(m_Temporary / "disk") {
+    std::filesystem::create_directory(m_Disk);
+    std::filesystem::create_directory(m_Temporary / "root");
+    m_Server.put("new.fw", tvx::test::firmwareImage("2.02a1", "TVX16", 200'000));
+  }
+  std::string withDisk(const std::string& size, const std::string& command) const {
+    return "unshare --mount --map-root-user sh -c 'mount -t tmpfs -o size=" + size + " tmpfs " +
+           m_Disk.string() + " && " + command + "'";
+  }
+  test::Outcome installWithDisk(const std::string& size) const {
+    return test::runShell(
+        withDisk(size, "{ env ASAN_OPTIONS=detect_leaks=0 TMPDIR=" + m_Disk.string() +
+                           " LD_LIBRARY_PATH=" CURL_FOLDER ":$LD_LIBRARY_PATH TVX_ROOT=" +
+                           (m_Temporary / "root").string() + " " TVXCIM " --sim firmware install " +
+                           port + " " + m_Server.url("new.fw") + "; result=$?; ls -A " +
+                           m_Disk.string() + "; exit $result; }"));
+  }
+
+  const std::filesystem::path m_Disk;
+  tvx::test::Http_Server m_Server;
+};
+
+TEST_F(FirmwareOnADiskTest, ThatIsFullTheFileIsNotAvailableAndNothingIsLeft) {
+  if (test::runShell(withDisk("16k", "true")).exitCode != 0) {
+    GTEST_SKIP() << "this machine lets nobody mount a disk of their own";
+  }
+  test::Outcome result = installWithDisk("64k");
+  EXPECT_EQ(result.exitCode, 9) << result.err;
+  EXPECT_EQ(result.out, std::string(port) + ": the firmware file is not available (4107)\n");
+  result = installWithDisk("1m");
+  EXPECT_EQ(result.exitCode, 0) << result.err;
+  EXPECT_EQ(result.out, std::string(port) + ": the firmware is installed (0)\n");
 }
 
 TEST_F(FirmwareProgramTest, TellsThatARebootIsNeeded) {

@@ -1,5 +1,9 @@
 // Firmware through the built library, as a client sees it.
+#include <unistd.h>
+
 #include <chrono>
+#include <cstdlib>
+#include <filesystem>
 #include <functional>
 #include <string>
 #include <thread>
@@ -170,6 +174,35 @@ TEST_F(Firmware, BadInputIsAnsweredAndNothingIsLeftOpen) {
   EXPECT_TRUE(isBackTo(before));
   EXPECT_EQ(instances("TVXHBA_FCPort").size(), 2u);
   EXPECT_EQ(fromURI(folder.path("image.fw")), 0u);
+}
+
+/// While it lives, the whole process may do no more than an account without rights.
+class Without_Rights {
+ public:
+  Without_Rights() : m_Before(::geteuid()) {
+    if (m_Before == 0 && ::seteuid(65534) != 0) std::abort();
+  }
+  ~Without_Rights() {
+    if (m_Before == 0 && ::seteuid(0) != 0) std::abort();
+  }
+  Without_Rights(const Without_Rights&) = delete;
+  Without_Rights& operator=(const Without_Rights&) = delete;
+
+ private:
+  uid_t m_Before;
+};
+
+TEST_F(Firmware, AFileThatCannotBeReadIsTheLibrarysRefusal) {
+  const std::string image = folder.path("image.fw");
+  std::filesystem::permissions(folder.path(""), std::filesystem::perms(0755));
+  std::filesystem::permissions(image, std::filesystem::perms::none);
+  {
+    const Without_Rights rights;
+    EXPECT_EQ(fromURI(image), 40026u);
+  }
+  EXPECT_TRUE(std::filesystem::exists(image));
+  std::filesystem::permissions(image, std::filesystem::perms(0600));
+  EXPECT_EQ(fromURI(image), 0u);
 }
 
 TEST_F(Firmware, AnotherTargetOrNoneIsAnswered) {
