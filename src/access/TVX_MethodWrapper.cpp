@@ -95,7 +95,7 @@ void initialiseAsFirst(Init_State& s, sem_t* semaphore) {
   TVX_LOG(TVX_DBG, "Aquired Semaphore.. Running RM_InitLib %s ", s.initName.c_str());
   s.firstComer = 1;
   s.doneSemaphore.store(openSemaphore(s.doneName, 0));
-  TVX_LOG(TVX_DBG, "Aquired Completed Semaphore.. Running RM_InitLib%s", s.doneName.c_str());
+  TVX_LOG(TVX_DBG, "Aquired Completed Semaphore.. Running RM_InitLib %s", s.doneName.c_str());
   runInitLib(s, semaphore);
 }
 

@@ -41,6 +41,7 @@ class Scripted_Curl {
   std::string present = "libcurl.so";  ///< the only file that opens
   std::set<std::string> missing;       ///< functions that it does not have
   std::map<int, int> optionCodes;      ///< answers of `curl_easy_setopt` other than 0
+  std::size_t failingOption = 0;       ///< the so many-th `curl_easy_setopt` answers 43; 0: none
   int globalInitCode = 0;
   bool easyInitFails = false;
   int performCode = 0;
@@ -130,6 +131,7 @@ class Scripted_Curl {
     }
     va_end(arguments);
     self.options.push_back(std::to_string(option) + "=" + value);
+    if (self.options.size() == self.failingOption) return 43;
     const auto code = self.optionCodes.find(option);
     return code != self.optionCodes.end() ? code->second : 0;
   }

@@ -78,7 +78,7 @@ TEST_F(Wrapper_Life, TheFirstComerInitialisesTheLibrary) {
   EXPECT_THAT(capture.texts(),
               ElementsAre("TVX_MethodWrapper::Constructor", "Setting Up for FIFO.. ",
                           "Aquired Semaphore.. Running RM_InitLib " + INIT + " ",
-                          "Aquired Completed Semaphore.. Running RM_InitLib" + DONE,
+                          "Aquired Completed Semaphore.. Running RM_InitLib " + DONE,
                           "Signalling Completed Semaphore.. Running RM_InitLib",
                           "Signaled Completed Semaphore.. Running RM_InitLib",
                           "RM Library initialized", "TVX_MethodWrapper::Destructor",

@@ -161,6 +161,14 @@ TEST_F(Upload, TheFirstFailedOptionEndsIt) {
   EXPECT_EQ(openDescriptors(), before);
 }
 
+TEST_F(Upload, TheFileAsInputIsAnOptionOfItsOwn) {
+  curl.failingOption = 5;  // its number is that of the data before it
+  EXPECT_EQ(upload(), -1);
+  EXPECT_TRUE(capture.has(3, "Error Setting CURLOPT_INFILE, errorcode = 43"));
+  EXPECT_EQ(curl.options.size(), 5u);
+  EXPECT_FALSE(called("curl_easy_perform"));
+}
+
 TEST_F(Upload, EachMissingFunctionHasItsText) {
   const struct {
     const char* function;

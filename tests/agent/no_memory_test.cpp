@@ -3,6 +3,7 @@
 #include "Map_Test.h"
 #include "agent/Associations.h"
 #include "agent/MapSteps.h"
+#include "agent/ProductSteps.h"
 
 namespace cimrt::test {
 namespace {
@@ -57,6 +58,18 @@ TEST_F(No_Memory, EveryKindOfAssociationTellsThatItCouldNotBeMade) {
     }
     EXPECT_EQ(log.level(rule.creationFailure), TVX_CRIT) << rule.className;
   }
+}
+
+TEST_F(No_Memory, DiagnosticsThatCannotBeMadeDoNotEndTheBuild) {
+  ProviderAgent& agent = build();
+  Host_Build host{agent};
+  host.system = agent.m_CIM_ComputerSystem_map[0];
+  // Instances that cannot be made have texts of their own; the texts within them have none.
+  for (std::size_t size = 24; size <= 256; size += 8) {
+    const Failing_New failing(size, 40);
+    EXPECT_EQ(buildDiagnostics(host), 0);
+  }
+  EXPECT_EQ(log.level("Exception in FCHBA Diagnostics feature class creation"), TVX_DBG);
 }
 
 }  // namespace

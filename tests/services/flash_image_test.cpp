@@ -75,6 +75,7 @@ TEST_F(Flash_Images, VersionThatCannotBeReadLeavesItsNumbersNull) {
   EXPECT_EQ(log.count("FlashContentsInstance - Parsing Success"), 1u);
   EXPECT_EQ(log.count("FlashContentsInstance - Parsing Done"), 2u);
   EXPECT_EQ(log.count("Generating TVXHBA_FlashImageSoftwareIdentity."), 1u);
+  EXPECT_EQ(log.level("Success..."), TVX_DBG);
 }
 
 TEST_F(Flash_Images, ProgramsAreTiedToThePort) {
