@@ -125,6 +125,26 @@ TEST_F(Driver_Log, OfAHostWithoutFCAdaptersIsNotBuilt) {
   EXPECT_EQ(agent->m_TVXHBA_RecordLog_map.size(), 1u);
 }
 
+TEST_F(Driver_Log, ARunWithoutCardsLeavesItOut) {
+  useScenario(R"({"cards": []})");
+  begin();
+  EXPECT_EQ(log.level("No FC card found"), TVX_DBG);
+  EXPECT_EQ(log.count("TVXHBA_DriverLogProfile constructor"), 0u);
+}
+
+TEST_F(Driver_Log, ARunThatEndsBeforeItLeavesItOutAndTheNextOneBuildsIt) {
+  useScenario(R"({"cards": [{"serial_number": "TWO", "adapter_per": "card",
+      "ports": [{"wwpn": "1000000000000001"}, {"wwpn": "1000000000000002"}]}]})");
+  begin();
+  EXPECT_EQ(log.level("Insert Failed (HBA): m_TVXHBA_PhysicalConnector"), TVX_CRIT);
+  EXPECT_EQ(log.count("TVXHBA_DriverLogProfile constructor"), 0u);
+  EXPECT_EQ(findRecordLog(*agent, driverLogInstanceID(*agent)), nullptr);
+  useScenario(singlePortCards(1));
+  refresh(*agent);
+  EXPECT_EQ(log.count("TVXHBA_DriverLogProfile constructor"), 1u);
+  EXPECT_NE(findRecordLog(*agent, driverLogInstanceID(*agent)), nullptr);
+}
+
 TEST_F(Driver_Log, ASecondBuildIsRefusedAndStopsNothing) {
   begin();
   Ranked_Lock data(agent->m_DataMutex);
