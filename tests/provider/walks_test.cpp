@@ -68,6 +68,62 @@ TEST_F(Walks, FromTheSystemToItsServicesAndBack) {
   }
 }
 
+TEST_F(Walks, FromTheSystemThroughTheHardwareToThePortAndBack) {
+  const struct {
+    const char* association;
+    const char* role;  // of the end that the way comes from
+    const char* resultRole;
+    const char* next;
+  } steps[] = {
+      {"TVXHBA_PortControllerSystemDevice", "GroupComponent", "PartComponent",
+       "TVXHBA_PortController"},
+      {"TVXHBA_PHYConnectorRealizesPortController", "Dependent", "Antecedent",
+       "TVXHBA_PhysicalConnector"},
+      {"TVXHBA_CardContainsConnector", "PartComponent", "GroupComponent", "TVXHBA_Card"},
+      {"TVXHBA_CardContainsChip", "GroupComponent", "PartComponent", "TVXHBA_Chip"},
+      {"TVXHBA_ConnectorDependsOnChip", "Dependent", "Antecedent", "TVXHBA_PhysicalConnector"},
+      {"TVXHBA_PHYConnectorRealizesPortController", "Antecedent", "Dependent",
+       "TVXHBA_PortController"},
+      {"TVXHBA_ControlledBy", "Antecedent", "Dependent", "TVXHBA_FCPort"},
+      {"TVXHBA_DeviceSAPImplementation", "Antecedent", "Dependent",
+       "TVXHBA_SCSIProtocolInitiatorEndpoint"},
+      {"TVXHBA_LocalHostedInitiatorAccessPoint", "Dependent", "Antecedent", "CIM_ComputerSystem"},
+  };
+  host::ObjectPath here = system();
+  for (const auto& step : steps) {
+    const auto next =
+        broker->associatorNames(here, step.association, step.next, step.role, step.resultRole);
+    ASSERT_EQ(next.status.rc, CMPI_RC_OK) << step.association << ": " << next.status.message;
+    ASSERT_EQ(next.paths.size(), 1u) << step.association;
+    EXPECT_EQ(next.paths[0].className, step.next);
+    // The system is another provider's, so there is only its name.
+    const bool isOwn = std::string(step.next).starts_with("TVXHBA_");
+    EXPECT_EQ(broker->associators(here, step.association, step.next, step.role, step.resultRole)
+                  .instances.size(),
+              isOwn ? 1u : 0u)
+        << step.association;
+    EXPECT_EQ(broker->references(here, step.association, step.role).instances.size(), 1u)
+        << step.association;
+    EXPECT_EQ(broker->references(here, step.association, step.resultRole).instances.size(), 0u)
+        << step.association;
+    const auto back = broker->associatorNames(next.paths[0], step.association, here.className,
+                                              step.resultRole, step.role);
+    ASSERT_EQ(back.paths.size(), 1u) << step.association;
+    EXPECT_EQ(back.paths[0].className, here.className);
+    here = next.paths[0];
+  }
+  EXPECT_EQ(here.key("Name").asText(), system().key("Name").asText());
+  EXPECT_EQ(behind(only("TVXHBA_Card"), "TVXHBA_ChassisContainsCard", "CreationClassName",
+                   "CIM_Chassis", "PartComponent", "GroupComponent"),
+            Texts{"CIM_Chassis"});
+  EXPECT_EQ(behind(only("TVXHBA_FCPort"), "TVXHBA_ElementStatisticalData", "InstanceID",
+                   "TVXHBA_FCPortStatistics", "ManagedElement", "Stats"),
+            Texts{"TVX FC HBA:HBA Statistics:1000000000000001"});
+  EXPECT_EQ(behind(only("TVXHBA_FCPortStatistics"), "TVXHBA_ElementStatisticalData", "DeviceID",
+                   "TVXHBA_FCPort", "Stats", "ManagedElement"),
+            Texts{"1000000000000001"});
+}
+
 TEST_F(Walks, RolesDecideWhichEndIsTheSource) {
   const host::ObjectPath host = system();
   const char* hosted = "TVXHBA_HostedBootBIOSService";
