@@ -313,6 +313,14 @@ std::string Instance::text(std::string_view name) const {
   return value == nullptr ? std::string() : value->display();
 }
 
+void Instance::addKeysAsProperties() {
+  for (const NamedValue& key : path.keys) {
+    if (!has(key.name)) {
+      properties.set(key.name, key.value);
+    }
+  }
+}
+
 bool Instance::operator==(const Instance& other) const {
   return path == other.path && properties == other.properties;
 }

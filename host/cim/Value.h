@@ -163,6 +163,9 @@ struct Instance {
   /// Display text of the property, "" if it is not there or null.
   std::string text(std::string_view name) const;
   bool has(std::string_view name) const { return properties.find(name) != nullptr; }
+  /// Adds each key of the path as a property where there is none of its name: providers look for
+  /// the keys of a changed instance among its properties.
+  void addKeysAsProperties();
   bool operator==(const Instance& other) const;
 };
 

@@ -266,11 +266,8 @@ ExitCode modify(Session& session) {
   for (const NamedValue& property : request.instance.properties) {
     request.properties->push_back(property.name);
   }
-  for (const NamedValue& key : request.path.keys) {
-    if (!request.instance.properties.find(key.name)) {
-      request.instance.properties.set(key.name, key.value);
-    }
-  }
+  request.instance.path = request.path;
+  request.instance.addKeysAsProperties();
   session.run(request);
   printPaths(session, {request.path});
   return ExitCode::Ok;

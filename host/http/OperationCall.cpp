@@ -279,6 +279,7 @@ void OperationCall::createInstance() {
 }
 
 void OperationCall::modify(Instance instance, PropertyList properties) {
+  instance.addKeysAsProperties();
   Request change = request(Operation::ModifyInstance, instance.path);
   change.properties = std::move(properties);
   change.instance = std::move(instance);

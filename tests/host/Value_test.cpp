@@ -153,5 +153,15 @@ TEST(ReturnCodeTest, CodesHaveNamesAndWords) {
   EXPECT_EQ(rcWords(42), "code 42");
 }
 
+TEST(InstanceTest, KeysBecomePropertiesWhereThereAreNone) {
+  Instance instance;
+  instance.path.keys = {{"Name", Value::string("a")}, {"Number", Value::number(CMPI_uint32, 1)}};
+  instance.properties = {{"NAME", Value::string("b")}, {"Color", Value::string("red")}};
+  instance.addKeysAsProperties();
+  EXPECT_EQ(instance.properties.size(), 3U);
+  EXPECT_EQ(instance.text("Name"), "b");
+  EXPECT_EQ(instance.property("Number").asUnsigned(), 1U);
+}
+
 }  // namespace
 }  // namespace tvx::host
