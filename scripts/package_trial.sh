@@ -33,7 +33,36 @@ test "$(tvxcim --sim classes | tail -n +2 | wc -l)" -ge 152
 tvxcim --sim ports
 test "$(tvxcim --sim ports | wc -l)" -eq 5
 tvxcim ports
-if command -v torvex-fc-register >/dev/null; then torvex-fc-register --dry-run; fi
+python3 /usr/share/torvex-fc-provider/simulator/make_firmware.py --version 2.02a1 --model TVX16 /tmp/new.fw
+tvxcim --sim firmware install 10:00:02:54:56:0C:41:10 /tmp/new.fw --reset 2>/dev/null
+tvxcim --sim firmware show | grep -q " 2.02a1 "
+echo "firmware was installed on a simulated adapter"
+
+# Commands of CIM servers that look at the files that they are given and tell what they were asked.
+status=0
+torvex-fc-register --dry-run 2>/dev/null || status=$?
+test "$status" -eq 3
+mkdir -p /tmp/server
+for name in cimmof cimprovider sfcbstage sfcbrepos sfcbunstage; do
+  cat >/tmp/server/$name <<"STAND_IN"
+#!/bin/sh
+for word in "$@"; do
+  case $word in /*) test -s "$word" || { echo "no file $word" >&2; exit 1; } ;; esac
+done
+echo "${0##*/}" >>/tmp/asked
+STAND_IN
+  chmod 755 /tmp/server/$name
+done
+for server in pegasus sfcb; do
+  for action in register unregister; do
+    PATH=/tmp/server:$PATH torvex-fc-register $action --server $server >/dev/null
+  done
+done
+test "$(wc -l </tmp/asked)" -eq 13
+echo "registered and unregistered with commands of both kinds of servers"
+for page in man1/tvxcim.1 man8/torvex-fc-register.8; do
+  test -e /usr/share/man/$page.gz || { grep -rq "path-exclude.*/man" /etc/dpkg && echo "no manual pages wanted here"; }
+done
 dpkg -L $names | sort -u | while read -r path; do [ -d "$path" ] || echo "$path"; done >/tmp/files
 apt-get purge -q -y $names >/dev/null 2>&1
 while read -r path; do [ ! -e "$path" ] || { echo "left behind: $path"; exit 1; }; done </tmp/files

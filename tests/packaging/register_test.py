@@ -4,6 +4,7 @@
 usage: register_test.py PROGRAM
 """
 
+import shutil
 import subprocess
 import sys
 import tempfile
@@ -22,8 +23,8 @@ class RegisterTest(unittest.TestCase):
         self.log = self.folder / "log"
         for part in ("bin", "data/mof", "data/registration"):
             (self.folder / part).mkdir(parents=True)
-        for name in ("sh", "sed", "dirname"):
-            (self.folder / "bin" / name).symlink_to(Path("/bin" if name != "dirname" else "/usr/bin") / name)
+        for name in ("sh", "sed", "dirname", "grep", "awk", "mktemp", "rm", "cat"):
+            (self.folder / "bin" / name).symlink_to(shutil.which(name))
 
     def tools(self, names, status=0):
         for name in names:
@@ -62,6 +63,44 @@ class RegisterTest(unittest.TestCase):
             "sfcbstage -n root/torvex -r registration/torvex_fc_sfcb.reg mof/torvex_fc_provider.mof",
             "sfcbstage -n root/pg_interop mof/torvex_fc_interop.mof", "sfcbrepos -f"])
 
+    def schema(self, text):
+        """A schema of the server in a folder with folders, and the shipped classes."""
+        folder = self.folder / "schema" / "Core"
+        folder.mkdir(parents=True)
+        (folder / "Some.mof").write_text(text)
+        (self.folder / "data/mof/torvex_fc_cim.mof").write_text(
+            "// Shipped.\n[Abstract]\nclass CIM_Old {\n  string A;\n};\n\n"
+            "[Abstract]\nclass CIM_Newer : CIM_Old {\n  string B;\n};\n")
+        (self.folder / "data/mof/torvex_fc_provider.mof").write_text("class TVXHBA_X : CIM_Newer {\n};\n")
+        (self.folder / "data/mof/torvex_fc_interop.mof").write_text("class TVXHBA_Y : CIM_Old {\n};\n")
+        return str(self.folder / "schema")
+
+    def keep_staged(self):
+        """A stand-in that keeps the class files that it was given."""
+        path = self.folder / "bin/sfcbstage"
+        path.write_text(f'#!/bin/sh\nfor last; do :; done\ncat "$last" >>"{self.folder}/staged"\n')
+        path.chmod(0o755)
+
+    def test_sfcb_gets_the_classes_that_its_schema_lacks(self):
+        self.tools(SFCB)
+        self.keep_staged()
+        result = self.run_program("--schema", self.schema("[Abstract]\n   class cim_nothing {};\nclass CIM_Old {\n};\n"))
+        self.assertEqual(result.returncode, 0, result.stderr)
+        self.assertIn("the server's schema lacks, and gets: CIM_Newer\n", result.stdout)
+        newer = "[Abstract]\nclass CIM_Newer : CIM_Old {\n  string B;\n};\n\n"
+        self.assertEqual((self.folder / "staged").read_text(),
+                         newer + "class TVXHBA_X : CIM_Newer {\n};\n" + newer + "class TVXHBA_Y : CIM_Old {\n};\n")
+        self.assertFalse(any(Path(word).exists() for word in result.stdout.split() if word.startswith(tempfile.gettempdir())
+                             and not word.startswith(str(self.folder))), "a temporary folder was left behind")
+
+    def test_sfcb_with_a_whole_schema_gets_the_shipped_files(self):
+        self.tools(SFCB)
+        result = self.run_program("--schema", self.schema("class CIM_Old {\n};\nclass CIM_Newer : CIM_Old {\n};\n"))
+        self.assertEqual(result.returncode, 0, result.stderr)
+        self.assertNotIn("lacks", result.stdout)
+        self.assertEqual(self.logged()[0], "sfcbstage -n root/torvex -r registration/torvex_fc_sfcb.reg "
+                                           "mof/torvex_fc_provider.mof")
+
     def test_sfcb_loses_its_stages(self):
         self.tools(SFCB)
         self.assertEqual(self.run_program("unregister").returncode, 0)
@@ -85,6 +124,14 @@ class RegisterTest(unittest.TestCase):
         self.assertEqual(self.run_program("dance").returncode, 2)
         self.assertEqual(self.run_program("--server", "other").returncode, 2)
         self.assertEqual(self.run_program("--server", "sfcb", "--data", "/nowhere").returncode, 5)
+        self.assertEqual(self.run_program("--server", "sfcb", "--schema", "/nowhere").returncode, 5)
+        self.assertEqual(self.run_program("--server").returncode, 2)
+
+    def test_each_command_is_told_before_it_runs(self):
+        self.tools(PEGASUS)
+        told = self.run_program().stdout.replace(str(self.folder / "data") + "/", "").splitlines()
+        self.assertEqual(told, self.logged())
+        self.assertEqual(len(told), 5)
 
 
 if __name__ == "__main__":
