@@ -86,4 +86,32 @@ std::optional<Value> scalarFromText(CMPIType type, const std::string& text) {
   }
 }
 
+std::string fittingText(CMPIType type) {
+  struct Row {
+    CMPIType type;
+    const char* text;
+  };
+  static constexpr Row rows[] = {
+      {CMPI_boolean, "true or false"},
+      {CMPI_uint8, "a number from 0 to 255"},
+      {CMPI_uint16, "a number from 0 to 65535"},
+      {CMPI_uint32, "a number from 0 to 4294967295"},
+      {CMPI_uint64, "a number from 0 to 18446744073709551615"},
+      {CMPI_sint8, "a number from -128 to 127"},
+      {CMPI_sint16, "a number from -32768 to 32767"},
+      {CMPI_sint32, "a number from -2147483648 to 2147483647"},
+      {CMPI_sint64, "a number from -9223372036854775808 to 9223372036854775807"},
+      {CMPI_real32, "a number such as 1.5 or -2e3"},
+      {CMPI_real64, "a number such as 1.5 or -2e3"},
+      {CMPI_char16, "one character or its number"},
+      {CMPI_dateTime, "a time as 20240229235959.000000+060 or a span as 00000001020304.000000:000"},
+  };
+  for (const Row& row : rows) {
+    if (row.type == type) {
+      return row.text;
+    }
+  }
+  return "a text";
+}
+
 }  // namespace tvx::host

@@ -13,4 +13,7 @@ namespace tvx::host {
 /// datetimes, a character or its number, any text for strings. Nothing if the text does not fit.
 std::optional<Value> scalarFromText(CMPIType type, const std::string& text);
 
+/// What fits such a type, for messages: "a number from 0 to 255", "true or false".
+std::string fittingText(CMPIType type);
+
 }  // namespace tvx::host

@@ -2,6 +2,8 @@
 
 #include <fmt/format.h>
 
+#include <cerrno>
+#include <cstring>
 #include <fstream>
 #include <iterator>
 
@@ -17,7 +19,8 @@ using Json = nlohmann::ordered_json;
 std::string readFile(const std::string& name) {
   std::ifstream stream(name, std::ios::binary);
   if (!stream) {
-    throw CommandError(ExitCode::File, fmt::format("cannot read the file '{}'", name));
+    throw CommandError(ExitCode::File,
+                       fmt::format("cannot read the file '{}': {}", name, std::strerror(errno)));
   }
   return {std::istreambuf_iterator<char>(stream), std::istreambuf_iterator<char>()};
 }
@@ -54,7 +57,8 @@ class ValueReader {
  private:
   [[noreturn]] void fail(const std::string& text) const {
     throw CommandError(ExitCode::BadArgument,
-                       fmt::format("'{}' does not fit '{}'", text, signatureOf(m_Feature)));
+                       fmt::format("'{}' does not fit '{}', which takes {}", text,
+                                   signatureOf(m_Feature), fittingText(m_Feature.cmpiType)));
   }
 
   Value scalar(const std::string& text) const {

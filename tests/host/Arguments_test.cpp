@@ -93,8 +93,10 @@ TEST(ArgumentsTest, BytesMayComeFromAFile) {
   std::ofstream(file, std::ios::binary) << std::string("\x00\xFF\x0A", 3);
   EXPECT_EQ(argument("Data=@" + file).asUnsignedList(), (std::vector<std::uint64_t>{0, 255, 10}));
   unlink(file.c_str());
-  EXPECT_EQ(refusal("Data=@/nowhere/bytes"),
-            std::pair(ExitCode::File, std::string("cannot read the file '/nowhere/bytes'")));
+  EXPECT_EQ(
+      refusal("Data=@/nowhere/bytes"),
+      std::pair(ExitCode::File,
+                std::string("cannot read the file '/nowhere/bytes': No such file or directory")));
 }
 
 struct MisfitRow {
@@ -112,20 +114,34 @@ TEST_P(MisfitTest, IsRefusedWithValueAndType) {
 
 INSTANTIATE_TEST_SUITE_P(
     Values, MisfitTest,
-    ::testing::Values(MisfitRow{"TooBig", "Coats=65536", "'65536' does not fit 'uint16 Coats'"},
-                      MisfitRow{"Negative", "Coats=-1", "'-1' does not fit 'uint16 Coats'"},
-                      MisfitRow{"NoNumber", "Coats=two", "'two' does not fit 'uint16 Coats'"},
-                      MisfitRow{"EmptyNumber", "Coats=", "'' does not fit 'uint16 Coats'"},
-                      MisfitRow{"Trailing", "Coats=1x", "'1x' does not fit 'uint16 Coats'"},
-                      MisfitRow{"SignedTooLow", "Small=-129", "'-129' does not fit 'sint8 Small'"},
-                      MisfitRow{"SignedTooHigh", "Small=128", "'128' does not fit 'sint8 Small'"},
-                      MisfitRow{"Overflow", "Big=18446744073709551616",
-                                "'18446744073709551616' does not fit 'uint64 Big'"},
-                      MisfitRow{"Real", "Share=1,5", "'1,5' does not fit 'real64 Share'"},
-                      MisfitRow{"Boolean", "On=maybe", "'maybe' does not fit 'boolean On'"},
-                      MisfitRow{"Time", "When=now", "'now' does not fit 'datetime When'"},
-                      MisfitRow{"Element", "Data=1,256", "'256' does not fit 'uint8[] Data'"},
-                      MisfitRow{"JsonElement", "Data=[256]", "'uint8[] Data': 256 is no uint8"}),
+    ::testing::Values(
+        MisfitRow{"TooBig", "Coats=65536",
+                  "'65536' does not fit 'uint16 Coats', which takes a number from 0 to 65535"},
+        MisfitRow{"Negative", "Coats=-1",
+                  "'-1' does not fit 'uint16 Coats', which takes a number from 0 to 65535"},
+        MisfitRow{"NoNumber", "Coats=two",
+                  "'two' does not fit 'uint16 Coats', which takes a number from 0 to 65535"},
+        MisfitRow{"EmptyNumber",
+                  "Coats=", "'' does not fit 'uint16 Coats', which takes a number from 0 to 65535"},
+        MisfitRow{"Trailing", "Coats=1x",
+                  "'1x' does not fit 'uint16 Coats', which takes a number from 0 to 65535"},
+        MisfitRow{"SignedTooLow", "Small=-129",
+                  "'-129' does not fit 'sint8 Small', which takes a number from -128 to 127"},
+        MisfitRow{"SignedTooHigh", "Small=128",
+                  "'128' does not fit 'sint8 Small', which takes a number from -128 to 127"},
+        MisfitRow{"Overflow", "Big=18446744073709551616",
+                  "'18446744073709551616' does not fit 'uint64 Big', which takes a number from 0 "
+                  "to 18446744073709551615"},
+        MisfitRow{"Real", "Share=1,5",
+                  "'1,5' does not fit 'real64 Share', which takes a number such as 1.5 or -2e3"},
+        MisfitRow{"Boolean", "On=maybe",
+                  "'maybe' does not fit 'boolean On', which takes true or false"},
+        MisfitRow{"Time", "When=now",
+                  "'now' does not fit 'datetime When', which takes a time as "
+                  "20240229235959.000000+060 or a span as 00000001020304.000000:000"},
+        MisfitRow{"Element", "Data=1,256",
+                  "'256' does not fit 'uint8[] Data', which takes a number from 0 to 255"},
+        MisfitRow{"JsonElement", "Data=[256]", "'uint8[] Data': 256 is no uint8"}),
     [](const auto& row) { return std::string(row.param.name); });
 
 TEST(ArgumentsTest, UnknownNamesSuggestKnownOnes) {

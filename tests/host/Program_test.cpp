@@ -2,6 +2,7 @@
 #include <gtest/gtest.h>
 #include <unistd.h>
 
+#include <filesystem>
 #include <fstream>
 #include <nlohmann/json.hpp>
 
@@ -221,6 +222,21 @@ TEST(ProgramTest, MethodsAreCalledWithTypedArguments) {
   const Outcome json = run(std::string("--json cm ") + first + " Paint Coats=2");
   EXPECT_EQ(jsonOf(json)["return"], 0);
   EXPECT_EQ(jsonOf(json)["outputs"]["Coats"], 3);
+}
+
+TEST(ProgramTest, MethodsTakeListsPathsInstancesAndFiles) {
+  const std::string file = testing::TempDir() + "image" + std::to_string(getpid());
+  std::ofstream(file, std::ios::binary) << std::string("\x00\xFF", 2);
+  const Outcome result =
+      run(std::string("cm ") + first + " Paint Data=@" + file +
+          R"( Words=a,b 'Targets=["FAKE_Widget.Number=1","FAKE_Widget.Number=2"]')"
+          R"( 'Setting={"class":"FAKE_Widget","properties":{"Color":"red"}}')");
+  std::filesystem::remove(file);
+  EXPECT_EQ(result.exitCode, 0) << result.err;
+  EXPECT_NE(
+      result.out.find(R"(Log = {"Data:8320", "Words:13824", "Targets:12544", "Setting:4096"})"),
+      std::string::npos)
+      << result.out;
 }
 
 TEST(ProgramTest, AReturnValueThatIsNotZeroIsCodeNine) {

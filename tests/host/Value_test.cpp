@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include "cim/ScalarText.h"
 #include "cim/TypeNames.h"
 
 namespace tvx::host {
@@ -161,6 +162,34 @@ TEST(InstanceTest, KeysBecomePropertiesWhereThereAreNone) {
   EXPECT_EQ(instance.properties.size(), 3U);
   EXPECT_EQ(instance.text("Name"), "b");
   EXPECT_EQ(instance.property("Number").asUnsigned(), 1U);
+}
+
+TEST(ScalarTextTest, TheEndsThatAreToldFitAndNoMore) {
+  struct Row {
+    CMPIType type;
+    const char* least;
+    const char* most;
+    const char* below;
+    const char* above;
+  };
+  const Row rows[] = {
+      {CMPI_uint8, "0", "255", "-1", "256"},
+      {CMPI_uint16, "0", "65535", "-1", "65536"},
+      {CMPI_uint32, "0", "4294967295", "-1", "4294967296"},
+      {CMPI_uint64, "0", "18446744073709551615", "-1", "18446744073709551616"},
+      {CMPI_sint8, "-128", "127", "-129", "128"},
+      {CMPI_sint16, "-32768", "32767", "-32769", "32768"},
+      {CMPI_sint32, "-2147483648", "2147483647", "-2147483649", "2147483648"},
+      {CMPI_sint64, "-9223372036854775808", "9223372036854775807", "-9223372036854775809",
+       "9223372036854775808"},
+  };
+  for (const Row& row : rows) {
+    EXPECT_EQ(fittingText(row.type), std::string("a number from ") + row.least + " to " + row.most);
+    EXPECT_TRUE(scalarFromText(row.type, row.least) && scalarFromText(row.type, row.most));
+    EXPECT_FALSE(scalarFromText(row.type, row.below) || scalarFromText(row.type, row.above));
+  }
+  EXPECT_EQ(fittingText(CMPI_char16), "one character or its number");
+  EXPECT_EQ(fittingText(CMPI_string), "a text");
 }
 
 }  // namespace
