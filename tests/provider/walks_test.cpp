@@ -216,5 +216,50 @@ TEST_F(Walks, ReferencesAreTheAssociationsThemselves) {
   }
 }
 
+// ---- Profiles of another provider
+
+constexpr const char* SERVER_PROFILES = R"({"version": 1, "namespaces": ["root/pg_interop"],
+    "instances": [
+      {"class": "PG_RegisteredProfile", "namespace": "root/pg_interop", "keys": ["InstanceID"],
+       "properties": {"InstanceID": "PG:Indications", "RegisteredName": "Indications"}},
+      {"class": "PG_RegisteredProfile", "namespace": "root/pg_interop", "keys": ["InstanceID"],
+       "properties": {"InstanceID": "PG:Base", "RegisteredName": "Base Server"}}]})";
+
+TEST_F(Walks, FromTheServersOwnProfileToThoseOfTheLibraryAndBack) {
+  broker->addForeign(SERVER_PROFILES);
+  const char* referenced = "TVXHBA_BaseServerReferencedProfile";
+  const host::ObjectPath base = {"",
+                                 "root/pg_interop",
+                                 "PG_RegisteredProfile",
+                                 {{"InstanceID", host::Value::string("PG:Base")}}};
+  host::ObjectPath other = base;
+  other.keys.set("InstanceID", host::Value::string("PG:Indications"));
+  EXPECT_EQ(behind(base, referenced, "InstanceID", "TVXHBA_RegisteredProfile", "Antecedent").size(),
+            12u);
+  EXPECT_TRUE(behind(other, referenced, "InstanceID").empty());
+
+  const host::Reply profiles = broker->associators(base, referenced);
+  EXPECT_EQ(profiles.status.rc, CMPI_RC_OK);
+  EXPECT_FALSE(profiles.report.leaks()) << profiles.report.text();
+  ASSERT_EQ(profiles.instances.size(), 12u);
+  for (const host::Instance& each : profiles.instances) {
+    EXPECT_EQ(each.path.nameSpace, "root/pg_interop");
+    EXPECT_EQ(behind(each.path, referenced, "InstanceID"), Texts{"PG:Base"});
+    // The server's own profile is fetched from the server.
+    const host::Reply back = broker->associators(each.path, referenced);
+    ASSERT_EQ(back.instances.size(), 1u);
+    EXPECT_EQ(back.instances[0].text("RegisteredName"), "Base Server");
+  }
+  EXPECT_EQ(broker->references(base, referenced, "Antecedent").instances.size(), 12u);
+  EXPECT_EQ(broker->referenceNames(base, referenced, "Dependent").paths.size(), 0u);
+}
+
+TEST_F(Walks, WithoutAProfileOfTheServerThereIsNothingToReferTo) {
+  EXPECT_TRUE(instances("TVXHBA_BaseServerReferencedProfile").empty());
+  broker->addForeign(R"({"version": 1, "namespaces": ["root/pg_interop"], "failures": [
+      {"class": "PG_RegisteredProfile", "operation": "enumerateInstances", "rc": 1}]})");
+  EXPECT_TRUE(instances("TVXHBA_BaseServerReferencedProfile").empty());
+}
+
 }  // namespace
 }  // namespace tvx::test
