@@ -1,5 +1,6 @@
 // Runtime values to CMPI values.
 #include <cstring>
+#include <type_traits>
 
 #include "cmpi/CMPI_Containers.h"
 #include "cmpi/CMPI_Object.h"
@@ -116,9 +117,12 @@ int write_scalar(const Place& place, const Value& value, CMPIData& data) {
   }
 }
 
+constexpr const char* NOT_TAKEN = "CMSetArrayElementAt() failed";
+
 /// Makes a CMPI array and fills it with `write(element, place of the CMPI value)`.
 template <class T, class Write>
 int write_array_of(const Place& place, const Value& value, CMPIData& data, Write&& write) {
+  constexpr bool is_instance = std::is_same_v<T, Instance*>;
   Array<T> array;
   if (value.get(array) != 0) return -1;
   const auto element_type = static_cast<CMPIType>(data.type & ~CMPI_ARRAY);
@@ -128,11 +132,12 @@ int write_array_of(const Place& place, const Value& value, CMPIData& data, Write
   for (CMPICount i = 0; i < count; ++i) {
     CMPIValue element = {};
     if (write(array[i], element) != 0) {
-      CIMRT_TRACE(LOG_WARN_, "element conversion failed");
+      // A text that the server does not make counts as an element that it does not take.
+      CIMRT_TRACE(LOG_WARN_, "%s", is_instance ? "element conversion failed" : NOT_TAKEN);
       return -1;
     }
     if (CMSetArrayElementAt(target, i, &element, element_type).rc != CMPI_RC_OK) {
-      CIMRT_TRACE(LOG_WARN_, "CMSetArrayElementAt() failed");
+      CIMRT_TRACE(LOG_WARN_, "%s", NOT_TAKEN);
       return -1;
     }
   }

@@ -14,9 +14,10 @@ class Way_Out : public Conversion {
               const char* name_space = "root/test") {
     return _to_cmpi_data(repository(), face(), name_space, value, flags, data);
   }
-  static Value of(Instance* instance) {
+  template <class T>
+  static Value of(const T& x) {
     Value value;
-    value.set(instance);
+    value.set(x);
     return value;
   }
 };
@@ -125,6 +126,20 @@ TEST_F(Way_Out, ARefusedElementFailsTheArray) {
   CMPIData data;
   EXPECT_EQ(_to_cmpi_data(repository(), &broker, "root/test", value, 0, data), -1);
   EXPECT_THAT(log.texts("WARN"), ElementsAre("CMSetArrayElementAt() failed"));
+}
+
+TEST_F(Way_Out, ATextThatTheServerDoesNotMakeFailsTheArray) {
+  const std::pair<const char*, Value> rows[] = {
+      {"newString", of(Array<String>{String("a"), String("b")})},
+      {"newDateTimeFromChars", of(Array<Datetime>{Datetime(TIME), Datetime(TIME)})}};
+  for (const auto& [function, value] : rows) {
+    faulty.fail(function, 2);
+    Trace_Log log;
+    CMPIData data;
+    EXPECT_EQ(to_data(value, data), -1);
+    EXPECT_THAT(log.texts("WARN"), ElementsAre("CMSetArrayElementAt() failed"));
+    faulty.heal();
+  }
 }
 
 }  // namespace

@@ -123,6 +123,19 @@ TEST_F(Server_Behaviours, NoKeyIsANumberThatAServerCouldWiden) {
     }
 }
 
+TEST_F(Server_Behaviours, KeysThatTheClassDoesNotHaveAreLeftAside) {
+  load();
+  for (const std::string& name : servedClasses()) {
+    const Reply names = broker->enumerateInstanceNames(name);
+    if (names.paths.empty()) continue;
+    ObjectPath path = names.paths.front();
+    path.keys.set("NoSuchKey", Value::number(CMPI_uint64, 1));
+    const Reply got = broker->getInstance(path);
+    EXPECT_EQ(got.status.rc, CMPI_RC_OK) << name << ": " << got.status.message;
+    EXPECT_FALSE(got.report.leaks()) << name << got.report.text();
+  }
+}
+
 TEST_F(Server_Behaviours, NumbersWrittenAsTextsAreReadByTheParametersType) {
   load();
   const ObjectPath log = [&] {
