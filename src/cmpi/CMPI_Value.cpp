@@ -1,5 +1,7 @@
 #include "cmpi/CMPI_Value.h"
 
+#include <new>
+
 #include "cmpi/CMPI_Containers.h"
 #include "cmpi/CMPI_Object.h"
 #include "cmpi/CMPI_Plain_Types.h"
@@ -99,8 +101,15 @@ const Meta_Class* class_at(const Place& place, const CMPIObjectPath* path) {
   return found;
 }
 
+/// Without memory for the nested instance the whole request fails, not this value alone: a provider
+/// must not take it for one that the client left out.
 int convert_all(Container& container, const Meta_Class* meta_class, Instance*& out) {
-  if (container.convert(meta_class, 0, out) == 0 && out) return 0;
+  try {
+    if (container.convert(meta_class, 0, out) == 0 && out) return 0;
+  } catch (const std::bad_alloc&) {
+    CIMRT_TRACE(LOG_WARN_, "failed to create CIMRT instance");
+    throw;
+  }
   CIMRT_TRACE(LOG_WARN_, "failed to create CIMRT instance");
   return -1;
 }

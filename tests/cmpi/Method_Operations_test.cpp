@@ -290,6 +290,19 @@ TEST_F(Method_Operations, WithoutMemoryTheCallFailsAndTheLogTellsWhatCouldNotBeM
   EXPECT_EQ(script.count(OPERATION_INVOKE_METHOD), 0u);
 }
 
+TEST_F(Method_Operations, WithoutMemoryForAReferenceTheWholeCallFails) {
+  script.invoke = [](const Instance*, Instance*) { return 0; };
+  const NamedValues arguments = {{"IPart", Any::reference(path_of("TEST_Part", "r"))}};
+  EXPECT_EQ(run(arguments).status.rc, CMPI_RC_OK);
+  Trace_Log log;
+  {
+    const Refused_Allocation refused(classes.part->size);
+    EXPECT_EQ(run(arguments).status.rc, CMPI_RC_ERR_FAILED);
+  }
+  EXPECT_THAT(log.texts("WARN"), ElementsAre("failed to create CIMRT instance"));
+  EXPECT_EQ(script.count(OPERATION_INVOKE_METHOD), 1u);
+}
+
 // ---- References and embedded instances
 
 TEST_F(Method_Operations, ReferencesAndEmbeddedInstancesArrive) {
