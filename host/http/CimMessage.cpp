@@ -30,10 +30,13 @@ std::string_view nameOf(const pugi::xml_node& node) {
   return node.name();
 }
 
-/// The document's one element. The reader drops what stands outside of elements.
+/// The document's one element.
 pugi::xml_node onlyRoot(const pugi::xml_document& document) {
   pugi::xml_node root;
   for (const pugi::xml_node& child : document.children()) {
+    if (!isElement(child) && !trimmed(child.value()).empty()) {
+      notWellFormed("text outside of the root element");
+    }
     if (isElement(child) && root) {
       notWellFormed("more than one root element");
     }
@@ -121,9 +124,10 @@ pugi::xml_node parseXml(pugi::xml_document& document, std::string& text) {
   if (!isXmlText(text)) {
     notWellFormed("not UTF-8, or characters that XML cannot hold");
   }
+  // As a fragment, so that text outside of elements is seen, not dropped.
   constexpr unsigned options = pugi::parse_cdata | pugi::parse_escapes |
                                pugi::parse_wconv_attribute | pugi::parse_eol |
-                               pugi::parse_ws_pcdata_single;
+                               pugi::parse_ws_pcdata_single | pugi::parse_fragment;
   const pugi::xml_parse_result result =
       document.load_buffer_inplace(text.data(), text.size(), options, pugi::encoding_utf8);
   if (!result) {

@@ -48,6 +48,9 @@ void checkLength(const HttpHead& head, std::size_t bodyLimit) {
     }
     return;
   }
+  if (head.field("transfer-encoding")) {
+    refuse(400, "the content has both a length and a transfer encoding");
+  }
   std::size_t bytes = 0;
   const char* end = length->data() + length->size();
   const auto result = std::from_chars(length->data(), end, bytes);

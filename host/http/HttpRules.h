@@ -25,7 +25,8 @@ struct HttpHead {
 
 /// Throws MessageError for a head that no body can make good: 405 for other methods than POST and
 /// M-POST, 404 for other paths than /cimom, 411 without a length, 413 for a length over
-/// `bodyLimit`, 415 for other contents than XML, 400 or 501 for the fields of CIM.
+/// `bodyLimit`, 400 for a length that is none, 415 for other contents than XML, 400 or 501 for the
+/// fields of CIM.
 void checkHead(const HttpHead& head, std::size_t bodyLimit);
 
 /// Throws MessageError (header-mismatch) if the fields tell another method or namespace than the

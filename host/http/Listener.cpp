@@ -41,9 +41,11 @@ std::string lowerCase(const char* text) {
   return result;
 }
 
+/// A field that is there several times is one with all the values.
 MHD_Result keepField(void* fields, MHD_ValueKind, const char* name, const char* value) {
-  (*static_cast<std::map<std::string, std::string>*>(fields))[lowerCase(name)] =
-      value == nullptr ? "" : value;
+  auto& all = *static_cast<std::map<std::string, std::string>*>(fields);
+  const auto [field, isNew] = all.try_emplace(lowerCase(name));
+  field->second += (isNew ? "" : ", ") + std::string(value == nullptr ? "" : value);
   return MHD_YES;
 }
 

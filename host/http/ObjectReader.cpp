@@ -146,6 +146,9 @@ Instance ObjectReader::instance(const pugi::xml_node& element) const {
       throw CimError(CMPI_RC_ERR_NO_SUCH_PROPERTY,
                      fmt::format("class {} has no property '{}'", classData->name, name));
     }
+    if (result.properties.find(feature->name) != nullptr) {
+      invalid(fmt::format("property {} is there twice", feature->name));
+    }
     result.properties.set(feature->name, value(*feature, child));
   }
   return result;

@@ -87,6 +87,13 @@ void OperationCall::checkParameters(const Row& row) const {
     if (!known) {
       invalid(fmt::format("{} has no parameter '{}'", row.name, each->name));
     }
+  }
+  checkOnce();
+}
+
+void OperationCall::checkOnce() const {
+  const auto& all = m_Message.parameters();
+  for (auto each = all.begin(); each != all.end(); ++each) {
     const bool twice = std::any_of(all.begin(), each, [&](const CimMessage::Parameter& other) {
       return sameName(other.name, each->name);
     });
@@ -119,6 +126,14 @@ ObjectPath OperationCall::requiredPath(const char* name) const {
 
 std::string OperationCall::text(const char* name) const {
   return elementText(element(name));
+}
+
+std::string OperationCall::requiredText(const char* name) const {
+  const std::string word = text(name);
+  if (word.empty()) {
+    invalid(fmt::format("{} needs {}", m_Message.name(), name));
+  }
+  return word;
 }
 
 bool OperationCall::flag(const char* name, bool otherwise) const {
@@ -302,7 +317,7 @@ void OperationCall::deleteInstance() {
 
 void OperationCall::getProperty() {
   const ObjectPath path = requiredPath("InstanceName");
-  const std::string name = text("PropertyName");
+  const std::string name = requiredText("PropertyName");
   const FeatureData* feature = findFeature(requireClass(path.className), name);
   if (feature == nullptr) {
     throw CimError(CMPI_RC_ERR_NO_SUCH_PROPERTY,
@@ -325,7 +340,7 @@ void OperationCall::getProperty() {
 void OperationCall::setProperty() {
   Instance instance;
   instance.path = requiredPath("InstanceName");
-  const std::string name = text("PropertyName");
+  const std::string name = requiredText("PropertyName");
   const FeatureData* feature = findFeature(requireClass(instance.className()), name);
   if (feature == nullptr) {
     throw CimError(CMPI_RC_ERR_NO_SUCH_PROPERTY,
@@ -425,6 +440,7 @@ void OperationCall::invokeMethod() {
     throw CimError(CMPI_RC_ERR_METHOD_NOT_FOUND,
                    fmt::format("class {} has no method '{}'", classData.name, m_Message.name()));
   }
+  checkOnce();
   const ObjectReader reader(m_Classes, target.nameSpace);
   Request invoke = request(Operation::InvokeMethod, target);
   invoke.method = method->name;

@@ -55,10 +55,12 @@ class OperationCall {
 
   // ---- Parameters ----
   void checkParameters(const Row& row) const;
+  void checkOnce() const;
   const CimMessage::Parameter* find(const char* name) const;
   pugi::xml_node element(const char* name) const;
   ObjectPath requiredPath(const char* name) const;
   std::string text(const char* name) const;
+  std::string requiredText(const char* name) const;
   bool flag(const char* name, bool otherwise) const;
   std::string classNameText(const char* name) const;
   std::optional<std::vector<std::string>> propertyList() const;

@@ -112,6 +112,16 @@ TEST_P(BadHeadTest, IsAnsweredByStatusAndTheServerLives) {
   expectAlive();
 }
 
+std::string deepXml(int depth) {
+  std::string open;
+  std::string close;
+  for (int i = 0; i < depth; ++i) {
+    open += "<A>";
+    close += "</A>";
+  }
+  return open + close;
+}
+
 const BadHead badHeads[] = {
     {"Get", "GET /cimom HTTP/1.1\r\nHost: h\r\n\r\n", "HTTP/1.1 405 ", "Allow: POST, M-POST\r\n"},
     {"OtherPath", "POST / HTTP/1.1\r\nHost: h\r\nContent-Length: 0\r\n\r\n", "HTTP/1.1 404 ",
@@ -143,6 +153,22 @@ const BadHead badHeads[] = {
      "HTTP/1.1 400 ", "CIMError: header-mismatch\r\n"},
     {"ShortLength", requestHead(listWidgets.size() - 20) + listWidgets, "HTTP/1.1 400 ",
      "CIMError: request-not-well-formed\r\n"},
+    {"TwoLengths",
+     "POST /cimom HTTP/1.1\r\nHost: h\r\nContent-Length: 5\r\nContent-Length: 50\r\n\r\n",
+     "HTTP/1.1 400 ", "length"},
+    {"LengthAndChunks",
+     "POST /cimom HTTP/1.1\r\nHost: h\r\nContent-Type: text/xml\r\nCIMOperation: MethodCall\r\n"
+     "Content-Length: 5\r\nTransfer-Encoding: chunked\r\n\r\n0\r\n\r\n",
+     "HTTP/1.1 400 ", "length"},
+    {"NegativeLength", "POST /cimom HTTP/1.1\r\nHost: h\r\nContent-Length: -1\r\n\r\n",
+     "HTTP/1.1 400 ", ""},
+    {"BadChunk",
+     "POST /cimom HTTP/1.1\r\nHost: h\r\nContent-Type: text/xml\r\nCIMOperation: MethodCall\r\n"
+     "Transfer-Encoding: chunked\r\n\r\nzz\r\nhello\r\n",
+     "HTTP/1.1 400 ", ""},
+    {"DeepXml", requestHead(700) + deepXml(100), "HTTP/1.1 400 ",
+     "CIMError: request-not-well-formed\r\n"},
+    {"OtherRoot", requestHead(7) + "<HTML/>", "HTTP/1.1 400 ", "CIMError: request-not-valid\r\n"},
     {"NoHttp", "\x16\x03\x01 hello\r\n\r\n", "HTTP/1.", ""},
     {"LongHead", "POST /cimom HTTP/1.1\r\nX: " + std::string(100000, 'x') + "\r\n\r\n",
      "HTTP/1.1 4", ""}};
@@ -159,6 +185,30 @@ TEST_F(ListenerTest, AChunkedBodyOverTheLimitIsRefused) {
   }
   EXPECT_THAT(exchange(bytes + "0\r\n\r\n"), StartsWith("HTTP/1.1 413 "));
   expectAlive();
+}
+
+TEST_F(ListenerTest, ABodyOfJustTheLimitIsTaken) {
+  const std::size_t limit = options().bodyLimit;
+  EXPECT_THAT(post(listWidgets + std::string(limit - listWidgets.size(), ' ')),
+              StartsWith("HTTP/1.1 200 "));
+}
+
+TEST_F(ListenerTest, AClientThatAsksWhetherToGoOnIsTold) {
+  RawClient client(m_Listener.port());
+  client.send(requestHead(listWidgets.size(), "Expect: 100-continue\r\n"));
+  client.send(listWidgets);
+  EXPECT_THAT(client.receive(), StartsWith("HTTP/1.1 100 Continue\r\n\r\nHTTP/1.1 200 "));
+}
+
+TEST_F(ListenerTest, OldClientsWithoutAHostAreServed) {
+  const std::string head =
+      "POST /cimom HTTP/1.0\r\nContent-Type: text/xml\r\nCIMOperation: MethodCall\r\n"
+      "Content-Length: ";
+  const std::string answer =
+      exchange(head + std::to_string(listWidgets.size()) + "\r\n\r\n" + listWidgets);
+  EXPECT_THAT(answer, StartsWith("HTTP/1."));
+  EXPECT_THAT(answer, HasSubstr(" 200 OK\r\n"));
+  EXPECT_THAT(answer, HasSubstr(">widget2<"));
 }
 
 TEST_F(ListenerTest, ALengthLargerThanTheBodyTimesOut) {
@@ -183,6 +233,57 @@ TEST_F(ListenerTest, ASilentClientIsEndedWithoutAnAnswer) {
   RawClient client(m_Listener.port());
   EXPECT_EQ(client.receive(), "");
   expectAlive();
+}
+
+TEST_F(ListenerTest, AClientThatTakesNoAnswersIsEnded) {
+  ListenerOptions quick = options();
+  quick.clientLimit = std::chrono::milliseconds(20);
+  const Listener listener(m_Server, quick);
+  RawClient client(listener.port(), 4096);
+  const auto start = std::chrono::steady_clock::now();
+  while (client.send(requestHead(listWidgets.size()) + listWidgets) &&
+         std::chrono::steady_clock::now() - start < std::chrono::seconds(20)) {
+  }
+  EXPECT_LT(std::chrono::steady_clock::now() - start, std::chrono::seconds(20));
+  expectAlive();
+}
+
+TEST_F(ListenerTest, ConnectionsOverTheLimitAreClosedUntilOthersEnd) {
+  ListenerOptions few = options();
+  few.connectionLimit = 3;
+  const Listener listener(m_Server, few);
+  std::vector<std::unique_ptr<RawClient>> silent;
+  for (unsigned i = 0; i < few.connectionLimit; ++i) {
+    silent.push_back(std::make_unique<RawClient>(listener.port()));
+    silent.back()->send("POST");
+  }
+  RawClient refused(listener.port());
+  refused.send(requestHead(listWidgets.size()) + listWidgets);
+  EXPECT_EQ(refused.receive(), "");
+  for (const auto& each : silent) {
+    each->receive();
+  }
+  std::string answer;
+  for (int i = 0; i < 100 && answer.empty(); ++i) {
+    RawClient next(listener.port());
+    next.send(requestHead(listWidgets.size()) + listWidgets);
+    answer = next.receive();
+  }
+  EXPECT_THAT(answer, StartsWith("HTTP/1.1 200 "));
+}
+
+TEST_F(ListenerTest, AListenerEndsWhileClientsAreConnected) {
+  auto listener = std::make_unique<Listener>(m_Server, options());
+  RawClient silent(listener->port());
+  RawClient slow(listener->port());
+  slow.send(requestHead(500) + "<CIM");
+  RawClient served(listener->port());
+  served.send(requestHead(listWidgets.size()) + listWidgets);
+  EXPECT_THAT(served.receive(), StartsWith("HTTP/1.1 200 "));
+  listener.reset();
+  EXPECT_EQ(silent.receive(), "");
+  slow.receive();
+  EXPECT_FALSE(slow.send(std::string(100, 'x')) && slow.send("x") && slow.send("x"));
 }
 
 TEST_F(ListenerTest, SlowClientsDoNotHinderOthers) {

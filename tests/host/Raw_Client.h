@@ -16,7 +16,12 @@ namespace tvx::host::test {
 /// One connection to a port of this machine.
 class RawClient {
  public:
-  explicit RawClient(std::uint16_t port) : m_Socket(socket(AF_INET, SOCK_STREAM, 0)) {
+  /// `receiveBuffer`: bytes that the system takes in for it before it is read; 0 leaves the usual.
+  explicit RawClient(std::uint16_t port, int receiveBuffer = 0)
+      : m_Socket(socket(AF_INET, SOCK_STREAM, 0)) {
+    if (receiveBuffer != 0) {
+      setsockopt(m_Socket, SOL_SOCKET, SO_RCVBUF, &receiveBuffer, sizeof receiveBuffer);
+    }
     sockaddr_in place{};
     place.sin_family = AF_INET;
     place.sin_port = htons(port);
