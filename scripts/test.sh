@@ -25,17 +25,6 @@ run_ctest() {
   (cd "$root" && ctest --preset "$preset" -j "$jobs" "$@")
 }
 
-# True if the leak checker itself broke down in every test that failed, which it does now and then while a process
-# ends: such a run says nothing, so it is repeated. A test that failed for another reason stays failed.
-only_leak_checker_failed() {
-  local results="$root/build/$1/Testing/Temporary" others
-  [ -f "$results/LastTestsFailed.log" ] || return 1
-  others=$(comm -23 <(cut -d: -f2 "$results/LastTestsFailed.log" | sort -u) \
-    <(awk '/^[0-9]+\/[0-9]+ Testing: /{ name = $3 }
-           /LeakSanitizer has encountered a fatal error/{ print name }' "$results/LastTest.log" | sort -u))
-  [ -z "$others" ]
-}
-
 for stage in "${stages[@]}"; do
   SECONDS=0
   case "$stage" in
@@ -49,7 +38,7 @@ for stage in "${stages[@]}"; do
     asan)
       step "AddressSanitizer, LeakSanitizer, UndefinedBehaviorSanitizer: the provider and the listener"
       configure_and_build asan
-      run_ctest asan || { only_leak_checker_failed asan && run_ctest asan --rerun-failed; } ;;
+      run_ctest asan ;;
     tsan)
       step "ThreadSanitizer: the concurrency tier"
       configure_and_build tsan tvx_concurrency_tests
