@@ -10,6 +10,7 @@
 #include <iterator>
 #include <memory>
 #include <optional>
+#include <utility>
 
 #include "runtime/Buffer.h"
 #include "runtime/Conversions.h"
@@ -33,7 +34,7 @@ constexpr mode_t DIRECTORY_MODE = 0777;
 
 constexpr const char* level_names[] = {"FATAL", "ERR", "WARN", "INFO", "DBG"};
 
-/// State of the log, guarded by `mutex`. Stays to the end of the process.
+/// State of the log, guarded by `mutex`. Stays until the library is taken out of the process.
 pthread_mutex_t mutex = PTHREAD_MUTEX_INITIALIZER;
 bool initialised = false;
 int current_level = LOG_FATAL_;
@@ -134,6 +135,15 @@ void set_up() {
   if (!level) return;
   current_level = *level;
   open_log(home);
+}
+
+/// Runs behind the last destructor of the library. What a thread that is still at work logs after
+/// it is lost.
+[[gnu::destructor]] void close_log() {
+  const Log_Guard guard;
+  delete std::exchange(file_lock, nullptr);
+  if (log_file) std::fclose(std::exchange(log_file, nullptr));
+  initialised = true;
 }
 
 /// Date and time without the fraction of the second.

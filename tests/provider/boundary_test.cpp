@@ -251,5 +251,25 @@ TEST_F(Traced, EveryOperationTellsItsBeginAndItsEnd) {
       (Lines{"enter: invokeMethod()", "return: invokeMethod(): CMPI_RC_ERR_METHOD_NOT_FOUND Fly"}));
 }
 
+std::size_t openFiles() {
+  const std::filesystem::directory_iterator files("/proc/self/fd");
+  return static_cast<std::size_t>(std::distance(begin(files), end(files)));
+}
+
+TEST_F(Traced, TheLogIsClosedWhenTheLibraryGoes) {
+  const auto serve = [&] {
+    instances("TVXHBA_Card");
+    unload();
+  };
+  serve();
+  const std::size_t before = openFiles();
+  for (int life = 0; life < 3; ++life) {
+    load();
+    serve();
+  }
+  EXPECT_EQ(openFiles(), before);
+  EXPECT_GT(std::filesystem::file_size(root / ".cimrt/messages"), 0U);
+}
+
 }  // namespace
 }  // namespace tvx::test
