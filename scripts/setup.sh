@@ -12,11 +12,11 @@ case "${1:-demo}" in
 esac
 
 packages=(g++ cmake ninja-build ccache python3 nlohmann-json3-dev libcli11-dev libfmt-dev
-          libpugixml-dev libmicrohttpd-dev librapidxml-dev)
+          libpugixml-dev libmicrohttpd-dev librapidxml-dev sblim-wbemcli)
 [ "$what" != package ] || packages+=(dpkg-dev file gzip lintian)
 if [ "$what" = test ]; then
   packages+=(libgtest-dev libgmock-dev libbenchmark-dev
-             libhbaapi-dev libhbaapi2 libcurl4 sblim-wbemcli binutils util-linux
+             libhbaapi-dev libhbaapi2 libcurl4 binutils util-linux
              clang clang-format clang-tidy cppcheck libclang-rt-14-dev)
 fi
 
