@@ -148,7 +148,7 @@ int TVX_MethodWrapper::uploadFileUsingCurl(const String& URI, const char* localP
     return UPLOAD_FAILED;
   }
   int result = CANNOT_OPEN;
-  if (const TVX_File file = tvxOpenFile(path, "rb")) {
+  if (const TVX_File file = tvxOpenFile(path)) {
     result = transfer(curl, easy, URI, file.get());
   }
   tearDown(curl, easy);

@@ -216,7 +216,7 @@ bool CLogger::takeDumpPath(const char* path) {
 
 void CLogger::loadConfig() {
   const std::string path = tvxPath(dumpPath().c_str());
-  const TVX_File stream = tvxOpenFile(path.c_str(), "r");
+  const TVX_File stream = tvxOpenFile(path.c_str());
   if (stream == nullptr) {
     TVX_LOG(TVX_ERR, "Unable to open config data file - %s", path.c_str());
     return;

@@ -222,14 +222,14 @@ constexpr std::size_t ISSUE_SIZE = 64 * 1024;
 
 std::string firstLine(const char* path) {
   std::array<char, OS_NAME_SIZE> line{};
-  const TVX_File stream = tvxOpenFile(tvxPath(path).c_str(), "r");
+  const TVX_File stream = tvxOpenFile(tvxPath(path).c_str());
   if (stream == nullptr || !tvxReadLine(stream.get(), line)) return "Unknown";
   line[std::strcspn(line.data(), "\r\n")] = '\0';
   return line.data();
 }
 
 int readDistribution(std::string& extended) {
-  const TVX_File stream = tvxOpenFile(tvxPath("/etc/issue").c_str(), "r");
+  const TVX_File stream = tvxOpenFile(tvxPath("/etc/issue").c_str());
   if (stream == nullptr) {
     TVX_LOG(TVX_DBG, "Unable to open the /etc/issue file to get OSDistribution Name");
     return 0;

@@ -1,11 +1,13 @@
 // Small text files: streams that close themselves, and lines of bounded length.
 #pragma once
 
+#include <fcntl.h>
+#include <unistd.h>
+
 #include <array>
 #include <cstdio>
 #include <cstring>
 #include <memory>
-#include <string>
 
 namespace cimrt {
 
@@ -16,10 +18,14 @@ struct TVX_Close_File {
 /// A stream that closes itself; null if the open failed.
 using TVX_File = std::unique_ptr<std::FILE, TVX_Close_File>;
 
-/// Opens a file; `mode` is that of `fopen`. The descriptor is not inherited by child processes.
-inline TVX_File tvxOpenFile(const char* path, const char* mode) {
-  const std::string flags = std::string(mode) + 'e';
-  return TVX_File(std::fopen(path, flags.c_str()));
+/// Opens a file for reading. No child process inherits the descriptor, and a pipe in the file's
+/// place is empty while it has no writer: it does not keep the caller waiting.
+inline TVX_File tvxOpenFile(const char* path) {
+  const int fd = ::open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK);
+  if (fd < 0) return nullptr;
+  TVX_File stream(::fdopen(fd, "r"));
+  if (stream == nullptr) ::close(fd);
+  return stream;
 }
 
 /// Reads one line into `line`, with its line feed if it fits; what is longer is cut off and passed

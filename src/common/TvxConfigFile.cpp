@@ -80,7 +80,7 @@ void TvxConfigFile::load(const char* path) {
   if (path == nullptr) return;
   m_Path = path;
   if (isMissing(path)) return;
-  const TVX_File stream = tvxOpenFile(path, "r");
+  const TVX_File stream = tvxOpenFile(path);
   if (stream == nullptr) {
     TVX_LOG(TVX_ERR, "Unable to open provider config setting file - %s", path);
     return;
@@ -180,7 +180,7 @@ std::string_view significant(std::string_view line) {
 
 WebLaunchConfig::WebLaunchConfig() {
   const std::string path = tvxPath(TVX_WEBLAUNCH_PATH);
-  const TVX_File stream = tvxOpenFile(path.c_str(), "r");
+  const TVX_File stream = tvxOpenFile(path.c_str());
   if (stream == nullptr) {
     TVX_LOG(TVX_INFO, "WebLaunch config file '%s' not found.", path.c_str());
     return;

@@ -43,7 +43,7 @@ int fail(int fd, int error) {
 int open_file(const std::string& path, const std::string& mode, mode_t permissions) {
   const bool shared = anybody_writes_in(folder_of(path));
   // A pipe that somebody put there must not keep the caller waiting.
-  const int guard = shared ? O_NOFOLLOW | O_NONBLOCK : 0;
+  const int guard = O_NONBLOCK | (shared ? O_NOFOLLOW : 0);
   const int fd = ::open(path.c_str(), flags_of(mode) | guard, permissions);
   if (fd < 0) return -1;
   if (shared && !is_own_plain_file(fd)) return fail(fd, EPERM);

@@ -15,8 +15,9 @@ inline constexpr mode_t SETTINGS_PERMISSIONS = 0644;
 /// Opens a stream on a file that is to be written; `mode` is "w", "a" or "a+". A file that is made
 /// gets `permissions`, less the process's mask, and no child process inherits it. In a folder where
 /// everybody may make files, such as /tmp, only a plain file of this user's own is opened: no link,
-/// nothing that somebody else has put there. Answers null, with `errno` set, on failure; the caller
-/// closes the stream.
+/// nothing that somebody else has put there. A pipe that nobody reads is no file to write to, and
+/// the call never waits for a reader. Answers null, with `errno` set, on failure; the caller closes
+/// the stream.
 std::FILE* open_for_writing(const char* path, const char* mode, mode_t permissions);
 
 }  // namespace cimrt

@@ -265,7 +265,7 @@ std::string readWholeFile(const char* path) {
   struct stat info = {};
   std::string text;
   if (::stat(path, &info) == 0 && S_ISREG(info.st_mode)) {
-    const TVX_File stream = tvxOpenFile(path, "r");
+    const TVX_File stream = tvxOpenFile(path);
     if (stream && isPlainFile(stream.get()) && readAll(stream.get(), text)) return text;
   }
   throw std::runtime_error("cannot open file " + tvxWithoutPassword(path));

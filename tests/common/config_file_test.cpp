@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <cerrno>
 #include <filesystem>
@@ -104,6 +105,18 @@ TEST_F(Config_File, ADirectoryInItsPlaceLeavesTheDefaults) {
   TvxConfigFile config;
   config.load(root.path(CONF).c_str());
   EXPECT_EQ(config.getCacheTimeout(), 10U);
+}
+
+TEST_F(Config_File, APipeInItsPlaceIsEmptyAndStays) {
+  ASSERT_EQ(::mkfifo(root.path(CONF).c_str(), 0600), 0);
+  const Log_Capture capture;
+  {
+    TvxConfigFile config;
+    config.load(root.path(CONF).c_str());
+    EXPECT_EQ(config.getCacheTimeout(), 10U);
+  }
+  EXPECT_TRUE(capture.lines().empty());
+  EXPECT_TRUE(std::filesystem::is_fifo(root.path(CONF)));
 }
 
 TEST_F(Config_File, ReadsTheThreeKeys) {

@@ -1,4 +1,5 @@
 #include <gtest/gtest.h>
+#include <sys/stat.h>
 
 #include <filesystem>
 #include <string>
@@ -100,6 +101,14 @@ TEST_F(Dump_File, ModeOneNeedsNoPath) {
   EXPECT_TRUE(getLogger().isEnabled());
 }
 
+TEST_F(Dump_File, ModeThreeIsTakenAndHasNoConsumer) {
+  load("3,3,1\n" + logPath());
+  EXPECT_EQ(getLogger().mode(), 3);
+  EXPECT_TRUE(getLogger().isEnabled());
+  EXPECT_FALSE(file.isOpen());
+  EXPECT_EQ(file.path(), "");
+}
+
 TEST_F(Dump_File, ModesTwoAndFourNeedAPathLine) {
   for (const char* contents : {"2,3,1\n", "4,3,1\n", "2,3,1", "2,3,1\n\n"}) {
     load(contents);
@@ -173,6 +182,16 @@ TEST_F(Dump_File, ADirectoryInItsPlaceChangesNothing) {
   getLogger().loadConfig();
   EXPECT_TRUE(isUnchanged());
   getLogger().writeDump();
+  EXPECT_TRUE(capture.has(cimrt::TVX_ERR, "Unable to open dump file\n"));
+}
+
+TEST_F(Dump_File, APipeInItsPlaceChangesNothing) {
+  ASSERT_EQ(::mkfifo(root.path(DUMP).c_str(), 0600), 0);
+  getLogger().loadConfig();
+  EXPECT_TRUE(isUnchanged());
+  EXPECT_TRUE(capture.has(cimrt::TVX_ERR,
+                          "Unable to read Log Mode from config data file - " + root.path(DUMP)));
+  EXPECT_FALSE(getLogger().writeDump());
   EXPECT_TRUE(capture.has(cimrt::TVX_ERR, "Unable to open dump file\n"));
 }
 

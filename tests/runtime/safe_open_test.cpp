@@ -132,6 +132,13 @@ TEST_F(Safe_Open_Test, ALinkInAFolderOfOnesOwnIsTheOwnersChoice) {
   EXPECT_EQ(read(own() / "elsewhere"), "line");
 }
 
+TEST_F(Safe_Open_Test, APipeThatNobodyReadsKeepsNobodyWaiting) {
+  ASSERT_EQ(mkfifo((own() / "pipe").c_str(), 0600), 0);
+  EXPECT_FALSE(open(own() / "pipe", "w"));
+  EXPECT_EQ(errno, ENXIO);
+  EXPECT_FALSE(open(own() / "pipe", "a"));
+}
+
 TEST_F(Safe_Open_Test, WhatCannotBeOpenedIsNull) {
   EXPECT_FALSE(open(own() / "no such folder" / "log", "a"));
   EXPECT_EQ(errno, ENOENT);
