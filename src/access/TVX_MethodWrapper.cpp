@@ -7,7 +7,6 @@
 
 #include <algorithm>
 #include <atomic>
-#include <cassert>
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
@@ -17,6 +16,7 @@
 #include "common/CLogger.h"
 #include "common/TVX_Memory.h"
 #include "runtime/Lasting.h"
+#include "runtime/Thread_Context.h"
 #include "runtime/Threads.h"
 
 namespace cimrt {
@@ -266,10 +266,9 @@ RM_STATUS readOsInfo(const void* block, char* osInfo) {
     return RM_ERROR;
   }
   const std::uint8_t* const attr = attribute.value;
-  assert("NULL check on " && attr);
-  const std::string text = attributeText(attribute);
-  std::strncpy(osInfo, text.c_str(), TVX_OS_INFO_SIZE);
-  return attr != nullptr ? RM_OK : RM_ERROR;
+  CIMRT_ASSERT("NULL check on " && attr);
+  std::strncpy(osInfo, attributeText(attribute).c_str(), TVX_OS_INFO_SIZE);
+  return RM_OK;
 }
 
 }  // namespace
