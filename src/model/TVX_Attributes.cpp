@@ -186,17 +186,15 @@ void FCAdapterAttributes::readBootCodeEnabled(const HBA_WWN&, const void* block)
 // ---- Port ----
 
 FCPortAttributes::FCPortAttributes(const Adapter* adapter, std::uint32_t index) {
-  {
-    const Snia_Adapter snia(adapter->getName());
-    HBA_PORTATTRIBUTES record;
-    const HBA_STATUS status = snia.portAttributes(index, record);
-    if (status != HBA_STATUS_OK) {
-      TVX_LOG(TVX_ERR, "(portIndex=%d) failed with hbaStatus %d", static_cast<int>(index),
-              static_cast<int>(status));
-      throw std::exception();
-    }
-    takeSnia(record);
+  HBA_PORTATTRIBUTES record;
+  // The adapter is closed again before anything is made of the answer.
+  const HBA_STATUS status = Snia_Adapter(adapter->getName()).portAttributes(index, record);
+  if (status != HBA_STATUS_OK) {
+    TVX_LOG(TVX_ERR, "(portIndex=%d) failed with hbaStatus %d", static_cast<int>(index),
+            static_cast<int>(status));
+    throw std::exception();
   }
+  takeSnia(record);
   TVX_LOG(TVX_DBG, "Port's WWPN: %s", PortWWN.c_str());
   readManagement(portNameToWWN(PortWWN));
 }

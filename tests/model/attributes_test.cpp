@@ -293,6 +293,30 @@ TEST_F(Discovery, APortThatFailsLeavesAGap) {
   EXPECT_EQ(data.m_Ports.size(), 2U);
 }
 
+TEST_F(Discovery, APortIsClosedBeforeItsFailureIsTold) {
+  host.add("Torvex-A0", 2).ports[1].statuses = {12};
+  host.libraries.provide(HBA_CloseAdapter, [this](HBA_HANDLE) {
+    --host.open;
+    TVX_LOG(TVX_DBG, "closed, %d open", host.open);
+  });
+  build();
+  const std::size_t failure = capture.position("(portIndex=1) failed with hbaStatus 12");
+  ASSERT_LT(failure, capture.lines().size());
+  EXPECT_EQ(capture.lines()[failure - 1].text, "closed, 0 open");
+  EXPECT_EQ(capture.count(TVX_DBG, "closed, 0 open"), 3U);  // the adapter, port 0, port 1
+}
+
+TEST_F(Discovery, APort0FailureIsToldBeforeTheAdapterIsClosed) {
+  host.add("Torvex-A0", 1).ports[0].statuses = {12};
+  host.libraries.provide(HBA_CloseAdapter, [this](HBA_HANDLE) {
+    --host.open;
+    TVX_LOG(TVX_DBG, "closed");
+  });
+  build();
+  EXPECT_EQ(capture.position("closed"),
+            capture.position("(portIndex = 0) failed with hbaStatus 12") + 1);
+}
+
 TEST_F(Discovery, APortStaleTwiceFails) {
   host.add("Torvex-A0", 2).ports[1].statuses = {8, 8};
   build();
