@@ -194,6 +194,8 @@ TEST_F(Installation, ALocalFileIsInstalledAndStays) {
                        "Entering TVX_MethodWrapper::UpdateFirmwareOnFlash",
                        "_FirmwareOnFlash : [ 2.02a1 ]"};
   EXPECT_EQ(log.only(texts), texts);
+  for (const std::size_t text : {3U, 8U}) EXPECT_EQ(log.level(texts[text]), TVX_DBG) << texts[text];
+  EXPECT_EQ(log.level(texts[4]), TVX_ERR);
   EXPECT_EQ(log.level(texts[7]), TVX_WARN);
 }
 
