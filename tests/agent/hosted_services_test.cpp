@@ -1,10 +1,31 @@
 // The five services, the access point and what they are tied to.
+#include <dlfcn.h>
+#include <sys/statvfs.h>
+
+#include <cstdlib>
+
 #include "Agent_Fixture.h"
 #include "Instance_Checks.h"
 #include "access/TVX_Runtime_Loader.h"
 #include "agent/HostedServices.h"
 #include "agent/Map_Insert.h"
 #include "agent/RegisteredProfiles.h"
+
+namespace {
+
+bool rootIsReadOnly = false;
+
+}  // namespace
+
+// The program brings its own statvfs, so that the root can be read-only.
+extern "C" int statvfs(const char* path, struct statvfs* info) noexcept {
+  using Function = int (*)(const char*, struct statvfs*);
+  static const auto real = reinterpret_cast<Function>(::dlsym(RTLD_NEXT, "statvfs"));
+  if (!rootIsReadOnly) return real(path, info);
+  *info = {};
+  info->f_flag = ST_RDONLY;
+  return 0;
+}
 
 namespace cimrt::test {
 namespace {
@@ -318,6 +339,23 @@ TEST_F(Curl_Capabilities, WithItTheNetworkSchemesAreOffered) {
   EXPECT_EQ(numbersOf(capabilities->SupportedURISchemes),
             (std::vector<std::uint16_t>{3, 4, 5, 6, 8}));
   EXPECT_EQ(log.count("ERROR: UNABLE TO CLOSE DYNAMIC LIB"), 0u);
+}
+
+/// Asks with a read-only root. 0 if files alone are offered and no library was looked for.
+int askOnReadOnlyRoot() {
+  rootIsReadOnly = true;
+  present = "libcurl.so";
+  setDlOperations(&LINKER);
+  const auto capabilities = makeInstance<TVXHBA_SoftwareInstallationServiceCapabilities>();
+  capabilities->SupportedURISchemes.set({3});
+  UpdateCURLCapabilities(*capabilities);
+  return opened.empty() && numbersOf(capabilities->SupportedURISchemes).size() == 1 ? 0 : 1;
+}
+
+// A process keeps what it once saw of the root: this one has to be new.
+TEST(Curl_Capabilities_Read_Only, AFetchedFileHasNowhereToGo) {
+  GTEST_FLAG_SET(death_test_style, "threadsafe");
+  EXPECT_EXIT(std::_Exit(askOnReadOnlyRoot()), testing::ExitedWithCode(0), "");
 }
 
 TEST_F(Curl_Capabilities, FailedCloseIsLogged) {

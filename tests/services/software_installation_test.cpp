@@ -661,9 +661,12 @@ TEST_F(Installation, AFailedErrorCorrectionLeavesThePort) {
   addFault(R"({"call": "LRM_SetAdapterAttribute", "status": 36})");
   EXPECT_EQ(setFEC({before != 1, 0}), 40036u);
   EXPECT_EQ(numberOf(port(FIRST)->FECState), before);
-  EXPECT_EQ(log.level("TVXHBA_SoftwareInstallationService_Provider::SetFECPortState failed for "
-                      "target 10000000000000A1"),
-            TVX_DBG);
+  const Texts texts = {
+      "TVXHBA_SoftwareInstallationService_Provider::SetFECPortState failed for target "
+      "10000000000000A1",
+      "Status: <36>"};
+  EXPECT_EQ(log.only(texts), texts);
+  for (const std::string& text : texts) EXPECT_EQ(log.level(text), TVX_DBG) << text;
 }
 
 // ---- SetPortEnabled ----
