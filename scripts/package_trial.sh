@@ -23,6 +23,7 @@ step "install, use, remove"
 run_in_root "$target" '
 set -e
 export DEBIAN_FRONTEND=noninteractive
+export TMPDIR=$(mktemp -d)
 names="torvex-fc-provider torvex-fc-tools"
 apt-get update -q >/dev/null
 apt-get install -q -y --reinstall --no-install-recommends /opt/packages/*.deb >/tmp/install.log 2>&1 || { cat /tmp/install.log; exit 1; }
@@ -34,6 +35,7 @@ tvxcim --sim ports
 test "$(tvxcim --sim ports | wc -l)" -eq 5
 tvxcim ports
 python3 /usr/share/torvex-fc-provider/simulator/make_firmware.py --version 2.02a1 --model TVX16 /tmp/new.fw
+! tvxcim --sim firmware show | grep -q " 2.02a1 "
 tvxcim --sim firmware install 10:00:02:54:56:0C:41:10 /tmp/new.fw --reset 2>/dev/null
 tvxcim --sim firmware show | grep -q " 2.02a1 "
 echo "firmware was installed on a simulated adapter"
@@ -42,6 +44,7 @@ echo "firmware was installed on a simulated adapter"
 status=0
 torvex-fc-register --dry-run 2>/dev/null || status=$?
 test "$status" -eq 3
+rm -f /tmp/asked
 mkdir -p /tmp/server
 for name in cimmof cimprovider sfcbstage sfcbrepos sfcbunstage; do
   cat >/tmp/server/$name <<"STAND_IN"
@@ -66,5 +69,6 @@ done
 dpkg -L $names | sort -u | while read -r path; do [ -d "$path" ] || echo "$path"; done >/tmp/files
 apt-get purge -q -y $names >/dev/null 2>&1
 while read -r path; do [ ! -e "$path" ] || { echo "left behind: $path"; exit 1; }; done </tmp/files
+rm -rf "$TMPDIR" /tmp/server /tmp/asked
 echo "removed: none of $(wc -l </tmp/files) files is left"
 '
