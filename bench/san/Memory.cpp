@@ -12,6 +12,10 @@ std::size_t allocatedBytes() {
   return info.uordblks + info.hblkhd;
 }
 
+void returnFreedMemory() {
+  malloc_trim(0);
+}
+
 std::size_t residentBytes() {
   std::size_t total = 0;
   std::size_t resident = 0;

@@ -8,6 +8,9 @@ namespace tvx::bench {
 /// Bytes in blocks that are allocated now, the allocator's own bytes around them included.
 std::size_t allocatedBytes();
 
+/// Gives what is free back to the system, so that what comes next does not depend on it.
+void returnFreedMemory();
+
 /// Bytes of this process that are in memory, pages shared with others included.
 std::size_t residentBytes();
 

@@ -1,5 +1,6 @@
-// bench_san [units...]: what many logical units cost, as Markdown tables. Without arguments 1,000,
-// 10,000 and 100,000 units are measured, which takes about two minutes and three gigabytes.
+// bench_san [build|classes] [units...]: what many logical units cost, as Markdown tables. Without
+// arguments 1,000, 10,000 and 100,000 units are measured, which takes about five minutes and two
+// gigabytes; "build" leaves the classes out, "classes" all else.
 #include <time.h>
 #include <unistd.h>
 
@@ -8,6 +9,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <filesystem>
+#include <functional>
 #include <string>
 #include <thread>
 #include <vector>
@@ -25,7 +27,8 @@
 namespace tvx::bench {
 namespace {
 
-constexpr int ROUNDS = 5;  ///< of which the fastest counts
+constexpr int SERIES = 3;  ///< of all sizes in turn; the median counts
+constexpr int ROUNDS = 5;  ///< of one size in a series; the median counts
 
 std::string number(double value, int digits) {
   char text[32];
@@ -48,18 +51,25 @@ void coolCaches() {
   for (std::size_t i = 0; i < other.size(); i += 64) other[i]++;
 }
 
-/// Milliseconds of the fastest of some rounds, each of which starts with cold caches.
-template <class Work>
-double fastest(const Work& work) {
-  double best = 0;
+double median(std::vector<double> values) {
+  std::sort(values.begin(), values.end());
+  return values[values.size() / 2];
+}
+
+/// Milliseconds of the middle one of some rounds, each of which starts with cold caches. What the
+/// work answers is disposed of outside of the measured time; `prepare` is called before each.
+template <class Work, class Prepare = void (*)()>
+double middleTime(
+    const Work& work, const Prepare& prepare = [] {}) {
+  std::vector<double> times;
   for (int round = 0; round < ROUNDS; round++) {
+    prepare();
     coolCaches();
     const double start = processorTime();
-    work();
-    const double taken = processorTime() - start;
-    best = round == 0 ? taken : std::min(best, taken);
+    [[maybe_unused]] const auto answer = work();
+    times.push_back(processorTime() - start);
   }
-  return best;
+  return median(times);
 }
 
 void require(bool holds, const char* what) {
@@ -131,8 +141,11 @@ Rows measureBuild(std::size_t units) {
   const Private_Root root;
   require(tvxsim_load_text(manyUnits(units, 0).c_str()) == 0, tvxsim_last_error());
   ProviderAgent& agent = startAgent();
-  const auto scan = [&] { agent.m_pData->buildSANData(); };
-  const auto build = [&] { require(agent.updateSANMaps() == 0, "the map build failed"); };
+  const auto scan = [&] { return agent.m_pData->buildSANData(), true; };
+  const auto build = [&] {
+    require(agent.updateSANMaps() == 0, "the map build failed");
+    return true;
+  };
 
   const std::size_t residentBefore = residentBytes();
   const std::size_t empty = allocatedBytes();
@@ -143,10 +156,12 @@ Rows measureBuild(std::size_t units) {
   const std::size_t resident = residentBytes() - residentBefore;
   require(agent.m_TVXHBA_StorageVolume_map.size() == units, "units are missing");
 
-  const double libraryTime =
-      fastest([&] { require(replayScan() == units, "the library tells of other units"); });
-  const double own = fastest(scan) - libraryTime;
-  const double buildTime = fastest(build);
+  const double libraryTime = middleTime([&] {
+    require(replayScan() == units, "the library tells of other units");
+    return true;
+  });
+  const double own = middleTime(scan) - libraryTime;
+  const double buildTime = middleTime(build);
 
   const auto perUnit = [&](std::size_t bytes) {
     return number(static_cast<double>(bytes) / static_cast<double>(units), 0);
@@ -202,7 +217,9 @@ Rows measureClasses(const Family& family, std::size_t units) {
   Rows rows;
   for (const char* name : family.classes) {
     require(broker.enumerateInstances(name).instances.size() == units, name);
-    rows.push_back({name, number(fastest([&] { broker.enumerateInstances(name); }), 1)});
+    const double time =
+        middleTime([&] { return broker.enumerateInstances(name); }, [] { returnFreedMemory(); });
+    rows.push_back({name, number(time, 1)});
   }
   broker.unload();
   return rows;
@@ -221,23 +238,51 @@ void printHead(std::vector<std::string> head) {
   printRow(head);
 }
 
-/// Growth of the last column over the one before it, for each ten times as many units.
-std::string ratio(const std::vector<std::string>& cells) {
-  if (cells.size() < 3) return "";
-  const double before = std::atof(cells[cells.size() - 2].c_str());
-  return before > 0 ? number(std::atof(cells.back().c_str()) / before, 1) : "";
+/// Growth of a time over that of the size before.
+std::string ratio(const std::vector<Rows>& results, std::ptrdiff_t size, std::size_t row,
+                  std::size_t cell = 1) {
+  if (size == 0) return "";
+  const auto time = [&](std::ptrdiff_t i) {
+    return std::atof(results[static_cast<std::size_t>(i)][row][cell].c_str());
+  };
+  return time(size - 1) > 0 ? number(time(size) / time(size - 1), 1) : "";
+}
+
+/// The rows of several series as one: numbers are the medians, texts those of the first.
+Rows middleRows(const std::vector<Rows>& series) {
+  Rows middle = series.front();
+  for (std::size_t row = 0; row < middle.size(); row++)
+    for (std::size_t cell = 1; cell < middle[row].size(); cell++) {
+      std::vector<double> values;
+      for (const Rows& rows : series) values.push_back(std::atof(rows[row][cell].c_str()));
+      const bool whole = middle[row][cell].find('.') == std::string::npos;
+      middle[row][cell] = number(median(values), whole ? 0 : 1);
+    }
+  return middle;
+}
+
+/// Measures all sizes in turn, and that several times: what else the machine does meets them all.
+/// The middle rows by size.
+std::vector<Rows> measureInTurn(const std::vector<std::size_t>& sizes,
+                                const std::function<Rows(std::size_t)>& measure) {
+  std::vector<std::vector<Rows>> found(sizes.size());
+  for (int series = 0; series < SERIES; series++)
+    for (std::size_t i = 0; i < sizes.size(); i++)
+      found[i].push_back(inChild([&] { return measure(sizes[i]); }));
+  std::vector<Rows> middle;
+  for (const std::vector<Rows>& series : found) middle.push_back(middleRows(series));
+  return middle;
 }
 
 void printBuild(const std::vector<std::size_t>& sizes) {
-  std::vector<Rows> results;
-  for (const std::size_t units : sizes)
-    results.push_back(inChild([units] { return measureBuild(units); }));
-  printHead({"Units", "Scan less the library, ms", "Library, ms", "Map build, ms",
-             "Resident bytes a unit"});
+  const std::vector<Rows> results = measureInTurn(sizes, measureBuild);
+  printHead({"Units", "Scan less the library, ms", "growth", "Library, ms", "Map build, ms",
+             "growth", "Resident bytes a unit"});
   for (std::size_t i = 0; i < sizes.size(); i++) {
-    std::vector<std::string> cells = results[i][0];
-    cells[0] = std::to_string(sizes[i]);
-    printRow(cells);
+    const std::vector<std::string>& cells = results[i][0];
+    const auto size = static_cast<std::ptrdiff_t>(i);
+    printRow({std::to_string(sizes[i]), cells[1], ratio(results, size, 0, 1), cells[2], cells[3],
+              ratio(results, size, 0, 3), cells[4]});
   }
   std::printf("\n");
   printHead({"Bytes a unit, of " + std::to_string(sizes.back()) + " units", "Bytes"});
@@ -247,21 +292,20 @@ void printBuild(const std::vector<std::size_t>& sizes) {
 
 void printClasses(const std::vector<std::size_t>& sizes) {
   std::vector<std::string> head = {"Class, ms"};
-  for (const std::size_t units : sizes) head.push_back(std::to_string(units) + " units");
-  head.push_back("last step");
+  for (const std::size_t units : sizes) {
+    head.push_back(std::to_string(units) + " units");
+    head.push_back("growth");
+  }
   printHead(head);
   for (const Family& family : FAMILIES) {
-    Rows table;
-    for (const std::size_t units : sizes) {
-      const Rows rows = inChild([&family, units] { return measureClasses(family, units); });
-      if (table.empty()) table.resize(rows.size());
-      for (std::size_t i = 0; i < rows.size(); i++) {
-        if (table[i].empty()) table[i].push_back(rows[i][0]);
-        table[i].push_back(rows[i][1]);
+    const std::vector<Rows> results = measureInTurn(
+        sizes, [&family](std::size_t units) { return measureClasses(family, units); });
+    for (std::size_t i = 0; i < family.classes.size(); i++) {
+      std::vector<std::string> row = {family.classes[i]};
+      for (const Rows& rows : results) {
+        row.push_back(rows[i][1]);
+        row.push_back(ratio(results, &rows - results.data(), i));
       }
-    }
-    for (std::vector<std::string>& row : table) {
-      row.push_back(ratio(row));
       printRow(row);
     }
   }
@@ -278,12 +322,16 @@ void findLibraries(char** arguments) {
 
 int run(int count, char** arguments) {
   findLibraries(arguments);
+  std::string part;
   std::vector<std::size_t> sizes;
-  for (int i = 1; i < count; i++)
-    sizes.push_back(std::strtoul(arguments[i], nullptr, 10) / 10 * 10);
+  for (int i = 1; i < count; i++) {
+    const std::size_t units = std::strtoul(arguments[i], nullptr, 10) / 10 * 10;
+    if (units > 0) sizes.push_back(units);
+    if (units == 0) part = arguments[i];
+  }
   if (sizes.empty()) sizes = {1'000, 10'000, 100'000};
-  printBuild(sizes);
-  printClasses(sizes);
+  if (part != "classes") printBuild(sizes);
+  if (part != "build") printClasses(sizes);
   return 0;
 }
 

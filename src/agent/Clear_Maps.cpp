@@ -1,4 +1,9 @@
 // Which maps a refresh empties, and in which order.
+#include <algorithm>
+#include <array>
+#include <cstdlib>
+#include <iterator>
+
 #include "agent/ProductSteps.h"
 #include "agent/ProviderAgent.h"
 
@@ -148,30 +153,62 @@ constexpr Clear_Map SERVICE_ASSOCIATIONS[] = {
     clearMap<&Agent_Maps::m_TVXHBA_FCHBADriverParamServiceAffectsFCPort_map>,
 };
 
+/// Names a map by its member pointer.
+using San_Map = Instance_Map_Base& (*)(Agent_Maps& maps);
+
+template <auto MEMBER>
+Instance_Map_Base& anyMap(Agent_Maps& maps) {
+  return maps.*MEMBER;
+}
+
 /// Targets and logical units.
-constexpr Clear_Map SAN[] = {
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIProtocolEndpoint_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_LogicalDisk_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_StorageVolume_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_TapeDrive_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_StorageExtent_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIArbitraryLogicalUnit_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_LocalHostedAccessPoint_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_LogicalDiskSystemDevice_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_StorageVolumeSystemDevice_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_TapeDriveSystemDevice_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_StorageExtentSystemDevice_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIArbitraryLogicalUnitSystemDevice_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetLogicalDiskPath_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetTapeDrivePath_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageExtentPath_map>,
-    clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath_map>,
+constexpr San_Map SAN[] = {
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIProtocolEndpoint_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_LogicalDisk_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_StorageVolume_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_TapeDrive_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_StorageExtent_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIArbitraryLogicalUnit_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_LocalHostedAccessPoint_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_LogicalDiskSystemDevice_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_StorageVolumeSystemDevice_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_TapeDriveSystemDevice_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_StorageExtentSystemDevice_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIArbitraryLogicalUnitSystemDevice_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetLogicalDiskPath_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetTapeDrivePath_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageExtentPath_map>,
+    anyMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath_map>,
 };
 
 template <std::size_t N>
 void clearGroup(Agent_Maps& maps, const Clear_Map (&group)[N]) {
   for (const Clear_Map clear : group) clear(maps);
+}
+
+/// Logical units whose instances go together.
+constexpr std::size_t SLICE = 256;
+
+/// Lets the allocator join the small blocks that were freed. It puts that off until a block of
+/// this size is asked for; without it the next maps would be built in the holes of these, in no
+/// order, and each refresh would take longer than the one before.
+void joinFreedMemory() {
+  constexpr std::size_t enough = std::size_t{64} << 10;
+  void* volatile block = std::malloc(enough);
+  std::free(block);
+}
+
+/// Takes the instances down unit by unit, as they were built. Those of one unit stand side by side
+/// and share texts: map by map, all of the memory would have to be fetched once for each map.
+void clearUnits(Agent_Maps& maps) {
+  std::array<std::size_t, std::size(SAN)> sizes{};
+  for (std::size_t i = 0; i < std::size(SAN); i++) sizes[i] = SAN[i](maps).size();
+  const std::size_t slices = *std::max_element(sizes.begin(), sizes.end()) / SLICE;
+  for (std::size_t left = slices; left-- > 0;) {
+    for (std::size_t i = 0; i < std::size(SAN); i++) SAN[i](maps).shorten(sizes[i] * left / slices);
+    joinFreedMemory();
+  }
 }
 
 }  // namespace
@@ -199,7 +236,8 @@ void ProviderAgent::clearAdapterMaps() {
 void ProviderAgent::clearSANMaps() {
   TVX_LOG(TVX_DBG, "PERF: Entered clearSANMaps()");
   try {
-    clearGroup(*this, SAN);
+    clearUnits(*this);
+    for (const San_Map map : SAN) map(*this).clear();
     TVX_LOG(TVX_DBG, "Exiting clearSANMaps()");
   } catch (...) {
     TVX_LOG(TVX_DBG, "Error in clearSANMaps()");

@@ -7,21 +7,15 @@ namespace {
 
 /// Clones every entry of `map` into `local`. False, with a message, if a clone is refused.
 bool copyEntries(const Instance_Map_Base& map, Instance_Map_Base& local) {
+  local.reserve(map.size());
   for (std::size_t i = 0; i < map.size(); i++) {
     Ref<Instance> copy(clone(map.at(i)));
-    if (local.insert(copy.get()) == Instance_Map_Base::npos) {
+    if (local.take(copy) == Instance_Map_Base::npos) {
       TVX_LOG(TVX_CRIT, "Insert failed for %zu", i);
       return false;
     }
-    copy.release();
   }
   return true;
-}
-
-/// Hands a clone of each entry to the handler, which owns it from then on, until it has enough.
-void deliver(const Instance_Map_Base& local, const Instance_Handler& handler) {
-  for (std::size_t i = 0; i < local.size(); i++)
-    if (!handler.handle(clone(local.at(i)))) return;
 }
 
 }  // namespace
@@ -37,7 +31,7 @@ void ProviderAgent::enumPlain(Instance_Map_Base& map, const Instance_Handler& ha
       Ranked_Lock data(m_DataMutex);
       if (!copyEntries(map, local)) return;
     }
-    deliver(local, handler);
+    local.drain(handler);
   } catch (...) {
     TVX_LOG(TVX_CRIT, "Exception in CIM Provider Enumeration - do nothing");
   }
@@ -62,7 +56,7 @@ void ProviderAgent::enumActive(Instance_Map_Base& map, const Instance_Handler& h
       }
       if (!copyEntries(map, local)) return;
     }
-    deliver(local, handler);
+    local.drain(handler);
   } catch (...) {
     TVX_LOG(TVX_CRIT, "Exception in Active CIM Provider Enumeration - do nothing");
   }
@@ -91,7 +85,7 @@ void ProviderAgent::enumSAN(Instance_Map_Base& map, const Instance_Handler& hand
       if (!copyEntries(map, local)) return;
       served = true;
     }
-    deliver(local, handler);
+    local.drain(handler);
   } catch (...) {
     TVX_LOG(TVX_CRIT, "Exception in SAN CIM Provider Enumeration - do nothing");
   }

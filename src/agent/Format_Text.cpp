@@ -2,17 +2,16 @@
 
 #include <cstdarg>
 
-#include "runtime/Buffer.h"
+#include "common/TVX_Formatted.h"
 
 namespace cimrt {
 
 std::string formatText(const char* format, ...) {
-  Buffer buffer;
   va_list args;
   va_start(args, format);
-  buffer.vformat(format, args);
+  const TVX_Formatted text(format, args);
   va_end(args);
-  return std::string(buffer.data(), buffer.size());
+  return std::string(text.view());
 }
 
 }  // namespace cimrt

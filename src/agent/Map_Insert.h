@@ -14,9 +14,12 @@
 
 namespace cimrt {
 
+/// The provider's namespace, as a text that all its instances share.
+const String& providerNameSpace();
+
 /// A new instance of T with its defaults, in the provider's namespace. The caller owns it.
 template <class T>
-Ref<T> makeInstance(const char* nameSpace = PROVIDER_NAME_SPACE) {
+Ref<T> makeInstance(const String& nameSpace = providerNameSpace()) {
   Ref<T> instance(T::create());
   instance->__name_space = nameSpace;
   return instance;
@@ -41,6 +44,14 @@ template <class T>
 T* insertInto(Instance_Map<T>& map, Ref<T> instance, const char* failure) {
   T* entry = instance.get();
   return insertInstance(map, Ref<Instance>(instance.release()), failure) ? entry : nullptr;
+}
+
+/// The same for an instance that is filled in: the map need not look at its keys again.
+bool insertFilled(Instance_Map_Base& map, Ref<Instance> instance, const char* failure);
+template <class T>
+T* insertFilledInto(Instance_Map<T>& map, Ref<T> instance, const char* failure) {
+  T* entry = instance.get();
+  return insertFilled(map, Ref<Instance>(instance.release()), failure) ? entry : nullptr;
 }
 
 /// Puts clones of the ends into the references of `association`, in the order of its class. An end
@@ -76,6 +87,20 @@ T* associate(Instance_Map<T>& map, const Instance* first, const Instance* second
   Ref<T> association = makeInstance<T>();
   setEnds(association.get(), {first, second, third});
   return insertInto(map, std::move(association), failure);
+}
+
+/// Puts the ends themselves into the references of `association`, which takes a share in each. For
+/// ends that are clones already and that nobody changes any more.
+void shareEnds(Instance* association, std::initializer_list<Instance*> ends);
+
+/// Makes an association of such ends, none of them null, and inserts it. The entry, or null with
+/// `failure` logged.
+template <class T>
+T* associateShared(Instance_Map<T>& map, std::initializer_list<Instance*> ends,
+                   const char* failure) {
+  Ref<T> association = makeInstance<T>();
+  shareEnds(association.get(), ends);
+  return insertFilledInto(map, std::move(association), failure);
 }
 
 /// The first entry of a map whose text property has that value, or null.

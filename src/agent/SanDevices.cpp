@@ -13,6 +13,8 @@ namespace {
 constexpr std::uint16_t STATUS_UNKNOWN = 0;
 constexpr const char* OS_DEVICE_NAME = "OS Device Name";
 constexpr const char* INQUIRY_DATA = "Standard SCSI inquiry data";
+constexpr const char* TAPE_INQUIRY_DATA = "standard SCSI Inquery data";
+constexpr const char* BYTE = "Byte";
 
 // --- What differs by class -----------------------------------------------------------------------
 
@@ -33,10 +35,11 @@ struct Class_Texts {
 };
 
 template <class Device>
-void setInfo(Device& device, const std::string& name, const std::string& inquiry,
+void setInfo(Device& device, const San_Unit_Build& build, const std::string& inquiry,
              const char* firstDescription, const char* secondDescription) {
-  device.OtherIdentifyingInfo.set({String(name.c_str()), String(inquiry.c_str())});
-  device.IdentifyingDescriptions.set({String(firstDescription), String(secondDescription)});
+  Constant_Texts& constants = build.port.san.constants;
+  device.OtherIdentifyingInfo.set({build.osDeviceName, String(inquiry.c_str())});
+  device.IdentifyingDescriptions.set({constants[firstDescription], constants[secondDescription]});
 }
 
 bool hasCapacity(const Target& target) {
@@ -44,10 +47,11 @@ bool hasCapacity(const Target& target) {
 }
 
 template <class Device>
-void setCapacity(Device& device, const Target& target) {
+void setCapacity(Device& device, const San_Unit_Build& build) {
+  const Target& target = build.target;
   if (!hasCapacity(target)) return;
   device.Capacity.set(target.blockCount * target.blockSize);
-  device.CapacityUnit.set("Byte");
+  device.CapacityUnit.set(build.port.san.constants[BYTE]);
 }
 
 template <class Device>
@@ -84,13 +88,16 @@ constexpr Name_Format NAME_FORMATS[] = {
     {1, "SCSI name std::string", 1, "SCSI name std::string"},
 };
 
-void setNameFormat(TVXHBA_StorageVolume& volume, std::uint32_t identifierType) {
+void setNameFormat(TVXHBA_StorageVolume& volume, const San_Unit_Build& build) {
+  const std::uint32_t identifierType = build.target.deviceIdentification.identifierType;
+  Constant_Texts& constants = build.port.san.constants;
   if (identifierType >= std::size(NAME_FORMATS)) return;
   const Name_Format& format = NAME_FORMATS[identifierType];
   volume.NameFormat.set(format.nameFormat);
-  if (format.otherNameFormat) volume.OtherNameFormat.set(format.otherNameFormat);
+  if (format.otherNameFormat) volume.OtherNameFormat.set(constants[format.otherNameFormat]);
   volume.NameNamespace.set(format.nameNamespace);
-  if (format.otherNameNamespace) volume.OtherNameNamespace.set(format.otherNameNamespace);
+  if (format.otherNameNamespace)
+    volume.OtherNameNamespace.set(constants[format.otherNameNamespace]);
 }
 
 template <>
@@ -109,10 +116,10 @@ struct Device_Class<TVXHBA_StorageVolume> {
 
   static void fill(TVXHBA_StorageVolume& volume, const San_Unit_Build& build) {
     setIdentifierName(volume, build);
-    setNameFormat(volume, build.target.deviceIdentification.identifierType);
-    setCapacity(volume, build.target);
+    setNameFormat(volume, build);
+    setCapacity(volume, build);
     setBlocks(volume, build.target);
-    setInfo(volume, build.target.osDeviceName, build.texts.inquiry, OS_DEVICE_NAME, INQUIRY_DATA);
+    setInfo(volume, build, build.texts.inquiry, OS_DEVICE_NAME, INQUIRY_DATA);
   }
 };
 
@@ -134,12 +141,12 @@ struct Device_Class<TVXHBA_TapeDrive> {
 
   static void fill(TVXHBA_TapeDrive& drive, const San_Unit_Build& build) {
     const Target& target = build.target;
-    drive.Name.set(target.osDeviceName.c_str());
-    setCapacity(drive, target);
-    setInfo(drive, target.osDeviceName,
+    drive.Name.set(build.osDeviceName);
+    setCapacity(drive, build);
+    setInfo(drive, build,
             formatText("%s %s %s", target.vendor.c_str(), target.model.c_str(),
                        target.revision.c_str()),
-            OS_DEVICE_NAME, "standard SCSI Inquery data");
+            OS_DEVICE_NAME, TAPE_INQUIRY_DATA);
   }
 };
 
@@ -162,9 +169,9 @@ struct Device_Class<TVXHBA_StorageExtent> {
   /// Clients know the descriptions in this order, which is not that of the values.
   static void fill(TVXHBA_StorageExtent& extent, const San_Unit_Build& build) {
     setIdentifierName(extent, build);
-    setCapacity(extent, build.target);
+    setCapacity(extent, build);
     setBlocks(extent, build.target);
-    setInfo(extent, build.target.osDeviceName, build.texts.inquiry, INQUIRY_DATA, OS_DEVICE_NAME);
+    setInfo(extent, build, build.texts.inquiry, INQUIRY_DATA, OS_DEVICE_NAME);
   }
 };
 
@@ -189,12 +196,12 @@ struct Device_Class<TVXHBA_LogicalDisk> {
 
   static void fill(TVXHBA_LogicalDisk& disk, const San_Unit_Build& build) {
     setIdentifierName(disk, build);
-    setCapacity(disk, build.target);
+    setCapacity(disk, build);
     setBlocks(disk, build.target);
     disk.DataOrganization.set(OTHER);
     disk.StatusInfo.set(NOT_KNOWN);
     disk.AdditionalAvailability.set({NOT_KNOWN});
-    setInfo(disk, build.target.osDeviceName, build.texts.inquiry, OS_DEVICE_NAME, INQUIRY_DATA);
+    setInfo(disk, build, build.texts.inquiry, OS_DEVICE_NAME, INQUIRY_DATA);
   }
 };
 
@@ -217,10 +224,10 @@ struct Device_Class<TVXHBA_SCSIArbitraryLogicalUnit> {
       "Insert Failed : m_TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath_map"};
 
   static void fill(TVXHBA_SCSIArbitraryLogicalUnit& unit, const San_Unit_Build& build) {
-    unit.Name.set(build.target.osDeviceName.c_str());
+    unit.Name.set(build.osDeviceName);
     unit.OtherDeviceType.set(
         formatText("Peripheral devices type is 0x%02X", build.target.deviceType).c_str());
-    setInfo(unit, build.target.osDeviceName, build.texts.inquiry, OS_DEVICE_NAME, INQUIRY_DATA);
+    setInfo(unit, build, build.texts.inquiry, OS_DEVICE_NAME, INQUIRY_DATA);
   }
 };
 
@@ -231,10 +238,10 @@ void fillCommon(Device& device, const San_Unit_Build& build, const char* classNa
                 const std::string& elementName) {
   const Unit_Texts& texts = build.texts;
   const CIM_ComputerSystem& system = *build.port.san.system;
-  device.Description.set(texts.description.c_str());
+  device.Description.set(build.description);
   device.SystemCreationClassName = system.CreationClassName;
   device.SystemName = system.Name;
-  device.CreationClassName.set(className);
+  device.CreationClassName.set(build.port.san.constants[className]);
   device.DeviceID.set(formatText("%s_%s_%s_%s", texts.port.c_str(), texts.target.c_str(),
                                  texts.identifier.c_str(), texts.lun.c_str())
                           .c_str());
@@ -244,22 +251,26 @@ void fillCommon(Device& device, const San_Unit_Build& build, const char* classNa
 }
 
 template <class Device>
-bool placeInSystem(San_Unit_Build& build, const Device* device) {
+bool placeInSystem(San_Unit_Build& build, const Device* device, Instance* deviceEnd) {
   using Class = Device_Class<Device>;
   const Class_Texts& texts = Class::TEXTS;
   San_Build& san = build.port.san;
   TVX_LOG(TVX_DBG, "Generating %s (%s)", texts.systemDevice, device->DeviceID.value.c_str());
-  return associate(san.agent.*Class::SYSTEM_DEVICES, san.system, device,
-                   texts.systemDeviceFailure) != nullptr;
+  return associateShared(san.agent.*Class::SYSTEM_DEVICES,
+                         {san.systemEnd.of(san.system), deviceEnd},
+                         texts.systemDeviceFailure) != nullptr;
 }
 
 template <class Device>
-bool buildPath(San_Unit_Build& build, const Device* device) {
+bool buildPath(San_Unit_Build& build, Instance* deviceEnd) {
   using Class = Device_Class<Device>;
   const Class_Texts& texts = Class::TEXTS;
   TVX_LOG(TVX_DBG, "creating %s - %s", texts.path, texts.label);
-  return associate(build.port.san.agent.*Class::PATHS, build.port.initiator, build.endpoint, device,
-                   texts.pathFailure) != nullptr;
+  San_Port_Build& port = build.port;
+  return associateShared(port.san.agent.*Class::PATHS,
+                         {port.initiatorEnd.of(port.initiator),
+                          build.endpointEnd.of(build.endpoint), deviceEnd},
+                         texts.pathFailure) != nullptr;
 }
 
 template <class Device>
@@ -270,10 +281,13 @@ std::int32_t buildDeviceOf(San_Unit_Build& build, const std::string& elementName
   fillCommon(*made, build, texts.className, elementName);
   Class::fill(*made, build);
   Device* device =
-      insertInto(build.port.san.agent.*Class::MAP, std::move(made), texts.deviceFailure);
+      insertFilledInto(build.port.san.agent.*Class::MAP, std::move(made), texts.deviceFailure);
   if (!device) return MAP_BUILD_FAILED;
   TVX_LOG(TVX_DBG, "%s: %s", texts.label, device->Caption.value.c_str());
-  return placeInSystem(build, device) && buildPath(build, device) ? 0 : MAP_BUILD_FAILED;
+  Shared_End end;
+  Instance* const deviceEnd = end.of(device);
+  const bool tied = placeInSystem(build, device, deviceEnd) && buildPath<Device>(build, deviceEnd);
+  return tied ? 0 : MAP_BUILD_FAILED;
 }
 
 // --- The class by device type --------------------------------------------------------------------

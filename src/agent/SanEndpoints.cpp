@@ -14,22 +14,25 @@ constexpr std::uint16_t CONNECTION_TYPE_FIBRE_CHANNEL = 2;
 constexpr std::uint16_t ROLE_TARGET = 3;
 constexpr std::uint16_t ENABLED_DEFAULT_NOT_APPLICABLE = 5;
 constexpr std::uint16_t UNKNOWN = 0;
+constexpr const char* CLASS_NAME = "TVXHBA_SCSIProtocolEndpoint";
+constexpr const char* OS_DEVICE_NAME = "OS Device Name";
 
 void nameEndpoint(TVXHBA_SCSIProtocolEndpoint& endpoint, const San_Unit_Build& build) {
   const Unit_Texts& texts = build.texts;
   const CIM_ComputerSystem& system = *build.port.san.system;
-  endpoint.TargetWWPN.set(texts.target.c_str());
-  endpoint.TargetWWNN.set(build.target.nodeWWN.c_str());
-  endpoint.Description.set(texts.description.c_str());
+  endpoint.TargetWWPN.set(build.port.targetWWPN(texts.target));
+  endpoint.TargetWWNN.set(build.port.targetWWNN(build.target.nodeWWN));
+  endpoint.Description.set(build.description);
   endpoint.SystemCreationClassName = system.CreationClassName;
   endpoint.SystemName = system.Name;
-  endpoint.CreationClassName.set("TVXHBA_SCSIProtocolEndpoint");
-  endpoint.ElementName.set(build.target.model.c_str());
+  endpoint.CreationClassName.set(build.port.san.constants[CLASS_NAME]);
+  endpoint.ElementName.set(build.port.model(build.target.model));
   endpoint.Name.set(
       formatText("%s:%s:%s", texts.port.c_str(), texts.target.c_str(), texts.lun.c_str()).c_str());
 }
 
-void describeEndpoint(TVXHBA_SCSIProtocolEndpoint& endpoint, const Target& target) {
+void describeEndpoint(TVXHBA_SCSIProtocolEndpoint& endpoint, const San_Unit_Build& build) {
+  const Target& target = build.target;
   endpoint.ProtocolType.set(PROTOCOL_TYPE_FIBRE_CHANNEL);
   endpoint.ProtocolIFType.set(PROTOCOL_IF_TYPE_FIBRE_CHANNEL);
   endpoint.ConnectionType.set(CONNECTION_TYPE_FIBRE_CHANNEL);
@@ -41,8 +44,8 @@ void describeEndpoint(TVXHBA_SCSIProtocolEndpoint& endpoint, const Target& targe
   endpoint.FCID.set(target.fcId);
   endpoint.SCSIBusNumber.set(target.scsiBusNumber);
   endpoint.SCSITargetNumber.set(target.scsiTargetNumber);
-  endpoint.OtherIdentifyingInfo.set({String(target.osDeviceName.c_str())});
-  endpoint.IdentifyingDescriptions.set({String("OS Device Name")});
+  endpoint.OtherIdentifyingInfo.set({build.osDeviceName});
+  endpoint.IdentifyingDescriptions.set({build.port.san.constants[OS_DEVICE_NAME]});
 }
 
 }  // namespace
@@ -60,9 +63,10 @@ std::int32_t buildTargetEndpoint(San_Unit_Build& build) {
   if (!san.system) throw std::exception();
   Ref<TVXHBA_SCSIProtocolEndpoint> endpoint = makeInstance<TVXHBA_SCSIProtocolEndpoint>();
   nameEndpoint(*endpoint, build);
-  describeEndpoint(*endpoint, build.target);
-  build.endpoint = insertInto(san.agent.m_TVXHBA_SCSIProtocolEndpoint_map, std::move(endpoint),
-                              "Insert Failed : m_TVXHBA_SCSIProtocolEndpoint_map");
+  describeEndpoint(*endpoint, build);
+  build.endpoint =
+      insertFilledInto(san.agent.m_TVXHBA_SCSIProtocolEndpoint_map, std::move(endpoint),
+                       "Insert Failed : m_TVXHBA_SCSIProtocolEndpoint_map");
   return build.endpoint ? 0 : MAP_BUILD_FAILED;
 }
 
@@ -73,8 +77,9 @@ std::int32_t hostTargetEndpoint(San_Unit_Build& build) {
                                       texts.target.c_str(), texts.lun.c_str());
   TVX_LOG(TVX_DBG, "Generating TVXHBA_LocalHostedAccessPoint (%s)", text.c_str());
   const bool hosted =
-      associate(san.agent.m_TVXHBA_LocalHostedAccessPoint_map, san.system, build.endpoint,
-                "Insert Failed : m_TVXHBA_LocalHostedAccessPoint_map") != nullptr;
+      associateShared(san.agent.m_TVXHBA_LocalHostedAccessPoint_map,
+                      {san.systemEnd.of(san.system), build.endpointEnd.of(build.endpoint)},
+                      "Insert Failed : m_TVXHBA_LocalHostedAccessPoint_map") != nullptr;
   return hosted ? 0 : MAP_BUILD_FAILED;
 }
 

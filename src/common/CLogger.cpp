@@ -13,6 +13,7 @@
 
 #include "common/TVX_Common.h"
 #include "common/TVX_File.h"
+#include "common/TVX_Formatted.h"
 #include "common/TVX_Path.h"
 #include "common/TVX_Replace_File.h"
 #include "runtime/Buffer.h"
@@ -71,10 +72,9 @@ CLogger& getLogger() {
 }
 
 void CLogger::log(const char* file, const unsigned* line, int level, const char* format, ...) {
-  Buffer text;
   va_list args;
   va_start(args, format);
-  text.vformat(format, args);
+  const TVX_Formatted text(format, args);
   va_end(args);
 
   // Held for a disabled logger too: its back end must not go away under the message.

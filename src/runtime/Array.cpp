@@ -30,15 +30,32 @@ bool equal_values(const void* a, const void* b) {
   return *static_cast<const T*>(a) == *static_cast<const T*>(b);
 }
 
-template <class T>
-constinit const Array_Traits plain = {sizeof(T), nullptr, nullptr, nullptr};
+/// Has no elements and is never written to. The spare bytes stand behind it as behind any rep.
+struct No_Room {
+  ArrayRep rep;
+  char spare[SPARE_BYTES];
+};
+
+using Construct = decltype(Array_Traits::construct);
+using Destroy = decltype(Array_Traits::destroy);
+using Equal = decltype(Array_Traits::equal);
+
+/// An element type of that size and those operations.
+template <std::size_t SIZE, Construct CONSTRUCT, Destroy DESTROY, Equal EQUAL>
+struct Element {
+  static No_Room no_room;
+  static constexpr Array_Traits traits = {SIZE, CONSTRUCT, DESTROY, EQUAL, &no_room.rep};
+};
+
+template <std::size_t SIZE, Construct CONSTRUCT, Destroy DESTROY, Equal EQUAL>
+constinit No_Room Element<SIZE, CONSTRUCT, DESTROY, EQUAL>::no_room = {{&traits, 0, 0, 0}, {}};
 
 template <class T>
-constinit const Array_Traits real = {sizeof(T), nullptr, nullptr, equal_values<T>};
-
+using Plain = Element<sizeof(T), nullptr, nullptr, nullptr>;
 template <class T>
-constinit const Array_Traits object = {sizeof(T), construct_from<T>, destroy_one<T>,
-                                       equal_values<T>};
+using Real = Element<sizeof(T), nullptr, nullptr, equal_values<T>>;
+template <class T>
+using Object = Element<sizeof(T), construct_from<T>, destroy_one<T>, equal_values<T>>;
 
 std::size_t block_size(const Array_Traits* traits, std::size_t capacity) {
   std::size_t bytes = 0;
@@ -76,6 +93,7 @@ void destroy_range(ArrayRep* rep, std::size_t pos, std::size_t n) {
 }
 
 ArrayRep* make(const Array_Traits* traits, const void* data, std::size_t n) {
+  if (n == 0 && traits->no_room) return traits->no_room;
   ArrayRep* rep = allocate(traits, n);
   copy_in(traits, rep->element(0), data, n);
   rep->size = n;
@@ -83,6 +101,7 @@ ArrayRep* make(const Array_Traits* traits, const void* data, std::size_t n) {
 }
 
 void release(ArrayRep* rep) {
+  if (rep == rep->traits->no_room) return;
   destroy_range(rep, 0, rep->size);
   std::free(rep);
 }
@@ -96,14 +115,22 @@ bool lies_in(const ArrayRep* rep, const void* data) {
 }  // namespace
 
 constinit const Array_Traits* const array_traits[NUM_TYPES] = {
-    &plain<bool>,         &plain<std::uint8_t>,  &plain<std::int8_t>,  &plain<std::uint16_t>,
-    &plain<std::int16_t>, &plain<std::uint32_t>, &plain<std::int32_t>, &plain<std::uint64_t>,
-    &plain<std::int64_t>, &real<float>,          &real<double>,        &plain<char16_t>,
-    &object<String>,      &object<Datetime>,
+    &Plain<bool>::traits,          &Plain<std::uint8_t>::traits,  &Plain<std::int8_t>::traits,
+    &Plain<std::uint16_t>::traits, &Plain<std::int16_t>::traits,  &Plain<std::uint32_t>::traits,
+    &Plain<std::int32_t>::traits,  &Plain<std::uint64_t>::traits, &Plain<std::int64_t>::traits,
+    &Real<float>::traits,          &Real<double>::traits,         &Plain<char16_t>::traits,
+    &Object<String>::traits,       &Object<Datetime>::traits,
 };
 
+namespace {
+
+constinit No_Room no_instances = {{&instance_array_traits, 0, 0, 0}, {}};
+
+}  // namespace
+
 // NOLINTNEXTLINE(bugprone-sizeof-expression): the elements are the bare pointers
-constinit const Array_Traits instance_array_traits = {sizeof(Instance*), nullptr, nullptr, nullptr};
+constinit const Array_Traits instance_array_traits = {sizeof(Instance*), nullptr, nullptr, nullptr,
+                                                      &no_instances.rep};
 
 Array_Base::Array_Base(const Array_Traits* traits) : _rep(allocate(traits, FIRST_CAPACITY)) {}
 
@@ -133,6 +160,10 @@ void Array_Base::assign(const void* data, std::size_t n) {
 
 void Array_Base::reserve(std::size_t n) {
   if (n <= _rep->capacity) return;
+  if (_rep == _rep->traits->no_room) {
+    _rep = allocate(_rep->traits, n);
+    return;
+  }
   auto* rep = static_cast<ArrayRep*>(std::realloc(_rep, block_size(_rep->traits, n)));
   if (!rep) throw std::bad_alloc();
   _rep = rep;

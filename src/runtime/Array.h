@@ -9,12 +9,16 @@
 
 namespace cimrt {
 
+struct ArrayRep;
+
 /// Operations of one element type.
 struct Array_Traits {
   std::size_t size;                               ///< element width in bytes
   void (*construct)(void* to, const void* from);  ///< copy into raw storage; null: plain byte copy
   void (*destroy)(void* element);                 ///< release one element; null: nothing to do
   bool (*equal)(const void* a, const void* b);    ///< null: byte comparison
+  /// The rep of capacity 0 that all arrays of this type without room share; null: each has its own.
+  ArrayRep* no_room = nullptr;
 };
 
 /// Traits by scalar `Type` code, 0 to 13.
@@ -38,9 +42,10 @@ struct ArrayRep {
   }
 };
 
-/// Untyped array: what generic code over meta data handles. Never shared; a copy is deep. Capacity
-/// is exact beyond the first eight elements. Positions behind the end are cut to it; indices of
-/// single elements are not checked. Elements handed in may lie in the array itself.
+/// Untyped array: what generic code over meta data handles. Elements are never shared; a copy is
+/// deep, and one of nothing takes no memory. Capacity is exact beyond the first eight elements.
+/// Positions behind the end are cut to it; indices of single elements are not checked. Elements
+/// handed in may lie in the array itself.
 class Array_Base {
  public:
   explicit Array_Base(const Array_Traits* traits);

@@ -32,7 +32,7 @@ const Array_Traits* element_traits(const Meta_Property* p) {
 
 void construct_property(void* p, const Meta_Property* mp) {
   if (mp->subscript != 0) {
-    ::new (p) Array_Base(element_traits(mp));
+    ::new (p) Array_Base(element_traits(mp), nullptr, 0);  // takes room when something comes in
   } else if (mp->type == STRING) {
     ::new (p) String;
   } else if (mp->type == DATETIME) {
@@ -82,10 +82,9 @@ void apply_default(Instance* instance, const Meta_Property* mp) {
   }
 }
 
-/// A record with its header filled and every byte behind it zero.
+/// A record with its header filled; the bytes behind it are for the caller to set.
 Instance* allocate(const Meta_Record* record) {
   void* block = ::operator new(record->size);
-  std::memset(block, 0, record->size);
   auto* instance = static_cast<Instance*>(block);
   ref(record);
   instance->magic = INSTANCE_MAGIC;
@@ -93,6 +92,15 @@ Instance* allocate(const Meta_Record* record) {
   instance->meta_class = record;
   ::new (&instance->__name_space) String;
   return instance;
+}
+
+/// What stands behind the header: the storage of all features.
+void* features_of(Instance* instance) {
+  return instance + 1;
+}
+
+std::size_t features_size(const Meta_Record* record) {
+  return record->size - sizeof(Instance);
 }
 
 void clone_property(void* to, const void* from, const Meta_Property* mp) {
@@ -144,6 +152,7 @@ void take_down(Instance* instance, std::uint64_t made) {
 
 Instance* create_record(const Meta_Record* record, bool defaults) {
   Instance* instance = allocate(record);
+  std::memset(features_of(instance), 0, features_size(record));
   std::uint64_t made = 0;
   try {
     while (made < record->num_meta_features) {
@@ -202,9 +211,7 @@ Instance* clone(const Instance* instance) {
   const Meta_Record* record = instance->meta_class;
   Instance* copy = allocate(record);
   copy->__name_space = instance->__name_space;
-  std::memcpy(reinterpret_cast<char*>(copy) + sizeof(Instance),
-              reinterpret_cast<const char*>(instance) + sizeof(Instance),
-              record->size - sizeof(Instance));
+  std::memcpy(features_of(copy), instance + 1, features_size(record));
   std::uint64_t made = 0;
   try {
     for (; made < record->num_meta_features; ++made)

@@ -1,5 +1,7 @@
 #include "runtime/Instance_Map.h"
 
+#include <utility>
+
 #include "runtime/Key_Index.h"
 
 namespace cimrt {
@@ -43,26 +45,56 @@ std::int32_t Instance_Map_Base::enum_instances(const Instance_Handler& handler) 
   return ENUM_INSTANCES_OK;
 }
 
-std::size_t Instance_Map_Base::insert(Instance* instance) {
-  if (find(instance) != npos) return npos;
-  const std::size_t i = _instances.size();
-  _instances.append(instance);
-  try {
-    _index->append(instance);
-  } catch (...) {
-    _instances.remove(i, 1);  // the caller keeps it
-    throw;
+void Instance_Map_Base::drain(const Instance_Handler& handler) {
+  // Null entries must not be seen, whatever the handler throws.
+  struct Rest {
+    Instance_Map_Base& map;
+    ~Rest() { map.clear(); }
+  } const rest{*this};
+  for (Instance*& entry : _instances) {
+    Instance* const copy = clone(entry);
+    destroy(std::exchange(entry, nullptr));
+    if (!handler.handle(copy, ENUM_INSTANCES_OK)) break;
   }
-  // Who inserts an instance still holds it and may go on filling it in.
-  _index->suspect(i);
+}
+
+/// `npos` for a key-equal instance. If it throws, the caller keeps the instance.
+std::size_t Instance_Map_Base::append(Instance* instance) {
+  _index->settle(_instances);
+  const Key_Index::Entry entry = _index->describe(instance);
+  const std::size_t same = _index->find_first(
+      instance, [&](std::size_t i) { return key_eq(_instances[i], instance); }, &entry);
+  if (same != npos) return npos;
+  // The list's own growth is by one: it would be moved at each step.
+  const std::size_t i = _instances.size();
+  if (i == _instances.capacity()) _instances.reserve(2 * i);
+  _index->append(entry);
+  _instances.append(instance);
   return i;
+}
+
+std::size_t Instance_Map_Base::insert(Instance* instance) {
+  const std::size_t i = append(instance);
+  // Who inserts an instance still holds it and may go on filling it in.
+  if (i != npos) _index->suspect(i);
+  return i;
+}
+
+std::size_t Instance_Map_Base::take(Ref<Instance>& instance) {
+  const std::size_t i = append(instance.get());
+  if (i != npos) instance.release();
+  return i;
+}
+
+void Instance_Map_Base::reserve(std::size_t n) {
+  _instances.reserve(n);
+  _index->reserve(n);
 }
 
 std::int32_t Instance_Map_Base::create_instance(const Instance* instance) {
   if (find(instance) != npos) return CREATE_INSTANCE_DUPLICATE;
   Ref<Instance> copy(clone(instance));
-  insert(copy.get());
-  copy.release();
+  take(copy);
   return CREATE_INSTANCE_OK;
 }
 
@@ -80,6 +112,13 @@ std::int32_t Instance_Map_Base::delete_instance(const Instance* model) {
   _instances.remove(i, 1);
   _index->remove(i);
   return DELETE_INSTANCE_OK;
+}
+
+void Instance_Map_Base::shorten(std::size_t n) {
+  if (n >= _instances.size()) return;
+  for (std::size_t i = n; i < _instances.size(); ++i) destroy(_instances[i]);
+  _instances.remove(n, _instances.size() - n);
+  _index->shorten(n);
 }
 
 void Instance_Map_Base::clear() {

@@ -42,12 +42,23 @@ class Instance_Map_Base {
   std::int32_t get_instance(const Instance* model, Instance*& out) const;
   /// A clone of each entry to the handler with status 0, until it answers false. Answers 0.
   std::int32_t enum_instances(const Instance_Handler& handler) const;
+  /// The same, but each entry is destroyed as soon as its clone is made, and in the end all are.
+  /// Memory that was just read is written to again, so a large map costs no more an entry than a
+  /// small one.
+  void drain(const Instance_Handler& handler);
   /// Takes ownership and answers the index when the key is new; `npos`, with the instance left to
   /// the caller, when a key-equal entry exists.
   std::size_t insert(Instance* instance);
+  /// The same for an instance that is filled in: its keys stay as they are until the entry is
+  /// fetched. Empties `instance` when it takes it.
+  std::size_t take(Ref<Instance>& instance);
+  /// Makes room for `n` entries in all.
+  void reserve(std::size_t n);
   std::int32_t create_instance(const Instance* instance);  ///< inserts a clone: 0 or 80
   std::int32_t modify_instance(const Instance* model, const Instance* instance);  ///< 0 or 100
   std::int32_t delete_instance(const Instance* model);                            ///< 0 or 90
+  /// Destroys the entries from `n` on, whatever their counts.
+  void shorten(std::size_t n);
   /// Destroys every entry, whatever its count.
   void clear();
 
@@ -56,6 +67,7 @@ class Instance_Map_Base {
 
  private:
   struct Index;
+  std::size_t append(Instance* instance);
   const Meta_Class* _meta_class;
   Array<Instance*> _instances;
   Index* _index;

@@ -1,7 +1,10 @@
 #include "runtime/Key_Index.h"
 
 #include <algorithm>
+#include <bit>
 #include <cstring>
+#include <limits>
+#include <stdexcept>
 #include <utility>
 
 #include "runtime/Key_Features.h"
@@ -89,14 +92,20 @@ void add_reference_array(Hash& hash, const Instance* instance, const Meta_Featur
   hash.add(targets_of(instance, f).size());
 }
 
+/// Whose keys a walk along a shape takes.
+enum class Fit {
+  EXACT,  ///< only an instance that has the shape itself
+  KEYS    ///< any that has the same keys
+};
+
 /// Hashes the keys of `instance` that entries of a shape have. `next` walks along the shape.
-/// False if no entry of that shape can be key-equal to the instance.
-bool add_keys(Hash& hash, const Instance* instance, const Meta_Record* const*& next) {
-  const Meta_Record* record = *next++;
-  const bool same_class = instance->meta_class == record;
-  for (std::uint64_t i = 0; i < record->num_meta_features; ++i) {
-    const Meta_Feature* key = record->meta_features[i];
-    if (!is_key(key) || is_method(key)) continue;
+/// False if the instance does not fit: no entry of that shape can be key-equal to it, or, with
+/// `EXACT`, it has another shape.
+bool add_keys(Hash& hash, const Instance* instance, const Key_Node*& next, Fit fit) {
+  const Key_Node& node = *next++;
+  const bool same_class = instance->meta_class == node.record;
+  if (fit == Fit::EXACT && !same_class) return false;
+  for (const Meta_Feature* key : node.keys) {
     const Meta_Feature* f = same_class ? key : matching_key(key, instance->meta_class);
     if (!f) return false;
     if (is_property(f)) {
@@ -105,10 +114,10 @@ bool add_keys(Hash& hash, const Instance* instance, const Meta_Record* const*& n
       add_reference_array(hash, instance, f);
     } else {
       const Instance* target = target_of(instance, f);
-      if ((target == nullptr) != (*next == nullptr)) return false;
+      if ((target == nullptr) != (next->record == nullptr)) return false;
       if (!target) {
         ++next;
-      } else if (!add_keys(hash, target, next)) {
+      } else if (!add_keys(hash, target, next, fit)) {
         return false;
       }
     }
@@ -116,45 +125,58 @@ bool add_keys(Hash& hash, const Instance* instance, const Meta_Record* const*& n
   return true;
 }
 
-void add_shape(Key_Shape& shape, const Instance* instance) {
-  shape.push_back(instance ? instance->meta_class : nullptr);
-  if (!instance) return;
-  const Meta_Record* record = instance->meta_class;
+/// The keys of a class, in the order of its features.
+std::vector<const Meta_Feature*> keys_of(const Meta_Record* record) {
+  std::vector<const Meta_Feature*> keys;
   for (std::uint64_t i = 0; i < record->num_meta_features; ++i) {
-    const Meta_Feature* key = record->meta_features[i];
-    if (is_key(key) && is_scalar_reference(key)) add_shape(shape, target_of(instance, key));
+    const Meta_Feature* f = record->meta_features[i];
+    if (is_key(f) && !is_method(f)) keys.push_back(f);
   }
+  return keys;
+}
+
+void add_shape(Key_Shape& shape, const Instance* instance) {
+  if (!instance) {
+    shape.push_back({nullptr, {}});
+    return;
+  }
+  const std::vector<const Meta_Feature*> keys = keys_of(instance->meta_class);
+  shape.push_back({instance->meta_class, keys});
+  for (const Meta_Feature* key : keys)
+    if (is_scalar_reference(key)) add_shape(shape, target_of(instance, key));
+}
+
+bool hash_keys(const Key_Shape& shape, const Instance* instance, Fit fit, std::uint64_t& out) {
+  Hash hash;
+  const Key_Node* next = shape.data();
+  if (!add_keys(hash, instance, next, fit)) return false;
+  out = hash.result();
+  return true;
 }
 
 }  // namespace
 
 bool Key_Index::project(const Key_Shape& shape, const Instance* model, std::uint64_t& out) {
-  Hash hash;
-  const Meta_Record* const* next = shape.data();
-  if (!add_keys(hash, model, next)) return false;
-  out = hash.result();
-  return true;
-}
-
-std::uint32_t Key_Index::shape_index(Key_Shape&& shape) {
-  std::size_t i = 0;
-  while (i < _shapes.size() && _shapes[i].shape != shape) ++i;
-  if (i == _shapes.size()) _shapes.push_back({std::move(shape), 0});
-  return static_cast<std::uint32_t>(i);
+  return hash_keys(shape, model, Fit::KEYS, out);
 }
 
 Key_Index::Entry Key_Index::describe(const Instance* instance) {
-  Key_Shape shape;
-  add_shape(shape, instance);
   std::uint64_t hash = 0;
-  project(shape, instance, hash);
-  return {hash, shape_index(std::move(shape)), false};
+  std::size_t s = 0;
+  while (s < _shapes.size() && !hash_keys(_shapes[s].shape, instance, Fit::EXACT, hash)) ++s;
+  if (s == _shapes.size()) {
+    Key_Shape shape;
+    add_shape(shape, instance);
+    hash_keys(shape, instance, Fit::EXACT, hash);
+    _shapes.push_back({std::move(shape), 0});
+  }
+  return {hash, static_cast<std::uint32_t>(s), false};
 }
 
 void Key_Index::place(std::size_t i) {
   std::size_t slot = home(_entries[i].hash);
-  while (_slots[slot] != 0) slot = next(slot);
-  _slots[slot] = i + 1;
+  while (_slots[slot].place != 0) slot = next(slot);
+  _slots[slot] = {static_cast<std::uint32_t>(i + 1), tag_of(_entries[i].hash)};
   ++_shapes[_entries[i].shape].entries;
 }
 
@@ -162,29 +184,37 @@ void Key_Index::place(std::size_t i) {
 void Key_Index::displace(std::size_t i) {
   --_shapes[_entries[i].shape].entries;
   std::size_t hole = home(_entries[i].hash);
-  while (_slots[hole] != i + 1) hole = next(hole);
+  while (_slots[hole].place != i + 1) hole = next(hole);
   const std::size_t mask = _slots.size() - 1;
-  for (std::size_t slot = next(hole); _slots[slot] != 0; slot = next(slot)) {
-    const std::size_t wanted = home(_entries[_slots[slot] - 1].hash);
+  for (std::size_t slot = next(hole); _slots[slot].place != 0; slot = next(slot)) {
+    const std::size_t wanted = home(_entries[_slots[slot].place - 1].hash);
     if (((slot - wanted) & mask) < ((slot - hole) & mask)) continue;
     _slots[hole] = _slots[slot];
     hole = slot;
   }
-  _slots[hole] = 0;
+  _slots[hole] = {};
 }
 
-void Key_Index::grow() {
-  const std::size_t n = _slots.empty() ? FIRST_SLOTS : _slots.size() * 2;
-  _slots.assign(n, 0);
+/// `n` is a power of two. A position has to fit in a slot.
+void Key_Index::set_slots(std::size_t n) {
+  if (n > std::numeric_limits<std::uint32_t>::max()) throw std::length_error("too many instances");
+  _slots.assign(n, {});
   for (Shape& shape : _shapes) shape.entries = 0;
   for (std::size_t i = 0; i < _entries.size(); ++i) place(i);
+  _is_stale = false;
 }
 
-void Key_Index::append(const Instance* instance) {
+void Key_Index::reserve(std::size_t n) {
+  _entries.reserve(n);
+  if (n * 2 > _slots.size()) set_slots(std::bit_ceil(std::max(n * 2, FIRST_SLOTS)));
+}
+
+void Key_Index::append(const Entry& entry) {
   // What needs memory comes before what is seen from outside.
-  if ((_entries.size() + 1) * 2 > _slots.size()) grow();
+  if ((_entries.size() + 1) * 2 > _slots.size())
+    set_slots(_slots.empty() ? FIRST_SLOTS : _slots.size() * 2);
   if (_suspects.size() == _suspects.capacity()) _suspects.reserve(2 * _suspects.size() + 1);
-  _entries.push_back(describe(instance));
+  _entries.push_back(entry);
   place(_entries.size() - 1);
 }
 
@@ -195,14 +225,22 @@ void Key_Index::remove(std::size_t i) {
   for (std::size_t& s : _suspects)
     if (s > i) --s;
   if (i == _entries.size()) return;
-  for (std::size_t& slot : _slots)
-    if (slot > i + 1) --slot;
+  for (Slot& slot : _slots)
+    if (slot.place > i + 1) --slot.place;
+}
+
+void Key_Index::shorten(std::size_t n) {
+  _entries.resize(n);
+  std::erase_if(_suspects, [n](std::size_t i) { return i >= n; });
+  _is_stale = true;
 }
 
 void Key_Index::clear() {
+  _is_stale = false;
   _shapes.clear();
   _entries.clear();
-  _slots.clear();
+  // As many entries are likely to come again: the room stays.
+  std::fill(_slots.begin(), _slots.end(), Slot{});
   _suspects.clear();
 }
 
@@ -213,6 +251,7 @@ void Key_Index::suspect(std::size_t i) {
 }
 
 void Key_Index::settle(const Array<Instance*>& instances) {
+  if (_is_stale) set_slots(_slots.size());
   for (const std::size_t i : _suspects) {
     const Entry now = describe(instances[i]);
     Entry& filed = _entries[i];

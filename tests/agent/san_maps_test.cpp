@@ -468,6 +468,62 @@ TEST_F(San_Maps, AssociationsOutliveTheirEnds) {
                    agent.m_CIM_ComputerSystem_map[0], volume.get()));
 }
 
+/// The records are of no C++ hierarchy: pointers are compared as those of their common base.
+const Instance* base(const Instance* instance) {
+  return instance;
+}
+
+TEST_F(San_Maps, UnitsShareWhatNobodyCanTellApart) {
+  ProviderAgent& agent = buildUnits(R"({"count": 2})");
+  const auto& hosted = agent.m_TVXHBA_LocalHostedAccessPoint_map;
+  const auto& paths = agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map;
+  const auto& systemDevices = agent.m_TVXHBA_StorageVolumeSystemDevice_map;
+  EXPECT_EQ(base(hosted[0]->Antecedent), base(hosted[1]->Antecedent));
+  EXPECT_EQ(base(systemDevices[1]->GroupComponent), base(hosted[0]->Antecedent));
+  EXPECT_EQ(base(paths[0]->Initiator), base(paths[1]->Initiator));
+  EXPECT_EQ(base(paths[1]->Target), base(hosted[1]->Dependent));
+  EXPECT_EQ(base(paths[1]->LogicalUnit), base(systemDevices[1]->PartComponent));
+  EXPECT_NE(base(paths[0]->LogicalUnit), base(paths[1]->LogicalUnit));
+  // The ends are no entries of their own maps, which may go first.
+  EXPECT_NE(base(hosted[0]->Antecedent), base(agent.m_CIM_ComputerSystem_map[0]));
+  EXPECT_NE(base(paths[0]->Target), base(agent.m_TVXHBA_SCSIProtocolEndpoint_map[0]));
+  const auto& volumes = agent.m_TVXHBA_StorageVolume_map;
+  EXPECT_EQ(volumes[0]->CreationClassName.value.rep(), volumes[1]->CreationClassName.value.rep());
+  EXPECT_EQ(volumes[0]->__name_space.rep(), paths[1]->__name_space.rep());
+}
+
+TEST_F(San_Maps, ReadersOfAssociationsHaveTheirEndsForThemselves) {
+  ProviderAgent& agent = buildUnits(R"({"count": 2})");
+  Delivered paths;
+  agent.enumSANInstances(agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map, paths.handler());
+  ASSERT_EQ(paths.size(), 2u);
+  using Path = TVXHBA_SCSIInitiatorTargetStorageVolumePath;
+  const Path* const own = agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map[0];
+  EXPECT_NE(paths.at<Path>(0)->Initiator, paths.at<Path>(1)->Initiator);
+  EXPECT_NE(paths.at<Path>(0)->Initiator, own->Initiator);
+  EXPECT_TRUE(identical(paths.at<Path>(0), own));
+}
+
+TEST_F(San_Maps, MapsOfManyUnitsAreEmptiedWhole) {
+  ProviderAgent& agent = buildUnits(R"([{"count": 700}, {"first": 700, "type": "tape"}])");
+  EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 700u);
+  EXPECT_EQ(agent.m_TVXHBA_TapeDrive_map.size(), 1u);
+  log.clear();
+  agent.clearSANMaps();
+  EXPECT_EQ(log.count("Exiting clearSANMaps()"), 1u);
+  for (const Instance_Map_Base* map :
+       {static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_SCSIProtocolEndpoint_map),
+        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_LocalHostedAccessPoint_map),
+        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_StorageVolume_map),
+        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_StorageVolumeSystemDevice_map),
+        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map),
+        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_TapeDrive_map),
+        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_SCSIInitiatorTargetTapeDrivePath_map)})
+    EXPECT_EQ(map->size(), 0u) << map->meta_class()->name;
+  EXPECT_EQ(agent.updateSANMaps(), 0);
+  EXPECT_EQ(agent.m_TVXHBA_SCSIProtocolEndpoint_map.size(), 701u);
+}
+
 TEST_F(San_Maps, OneRemotePortBehindTwoPortsIsTwo) {
   build(R"({"cards": [{"serial_number": "A", "ports": [
     {"wwpn": "1000000000000001", "targets": [{"wwpn": "5000000000000001", "luns": {"count": 2}}]},

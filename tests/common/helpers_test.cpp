@@ -1,6 +1,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <cstdarg>
 #include <filesystem>
 #include <stdexcept>
 #include <string>
@@ -8,6 +9,7 @@
 #include "common/CLogger.h"
 #include "common/TVX_Clock.h"
 #include "common/TVX_Common.h"
+#include "common/TVX_Formatted.h"
 #include "common/TVX_Memory.h"
 #include "common/TVX_Path.h"
 #include "support/Log_Capture.h"
@@ -24,6 +26,26 @@ using tvx::test::Temp_Root;
 
 constexpr int FAILED = 0x8001;
 constexpr std::uint8_t NAME[] = {0x10, 0x00, 0x02, 0xAB, 0xcd, 0x0E, 0xF0, 0x01};
+
+// ---- Formatted texts ----
+
+__attribute__((format(printf, 1, 2))) std::string formatted(const char* format, ...) {
+  va_list args;
+  va_start(args, format);
+  const cimrt::TVX_Formatted text(format, args);
+  va_end(args);
+  EXPECT_STREQ(text.c_str(), std::string(text.view()).c_str());
+  return std::string(text.view());
+}
+
+TEST(Formatted, TextsOfAnyLengthAreWhole) {
+  EXPECT_EQ(formatted("%d of %s", 3, "four"), "3 of four");
+  EXPECT_EQ(formatted("%s", ""), "");
+  for (const std::size_t size : {511U, 512U, 513U, 5000U, 100000U}) {
+    const std::string text(size, 'x');
+    EXPECT_EQ(formatted("%s|%d", text.c_str(), 7), text + "|7") << size;
+  }
+}
 
 // ---- Text forms ----
 

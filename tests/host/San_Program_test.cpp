@@ -22,7 +22,13 @@ TEST_F(SanProgramTest, LunsOfOnePort) {
   const test::Outcome result = run("--sim luns 10:00:02:54:56:0c:41:10");
   EXPECT_EQ(lines(result.out), 9U) << result.out << result.err;
   EXPECT_EQ(result.out.find("10:00:02:54:56:0C:41:11"), std::string::npos) << result.out;
-  EXPECT_NE(run("--sim luns 10:00:00:00:00:00:00:99").exitCode, 0);
+  const test::Outcome none = run("--sim luns 10:00:00:00:00:00:00:99");
+  EXPECT_EQ(none.exitCode, 6);
+  EXPECT_NE(none.err.find("there is no port '10:00:00:00:00:00:00:99'; the ports are 10:00:02:"),
+            std::string::npos)
+      << none.err;
+  EXPECT_EQ(none.out, "");
+  EXPECT_EQ(lines(run("--sim luns 10:00:02:54:56:0A:7E:21").out), 1U) << "a port without units";
 }
 
 TEST_F(SanProgramTest, LunsInJson) {

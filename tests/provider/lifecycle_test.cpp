@@ -1,4 +1,5 @@
 // Load, serve, clean up, unload and load again, in one process.
+#include <chrono>
 #include <thread>
 
 #include "Provider_Fixture.h"
@@ -60,6 +61,29 @@ TEST_F(Lifecycle, UnloadInTheMiddleOfARefreshWaitsForIt) {
   unload();
   EXPECT_GT(tvxsim_calls("HBA_SendReadCapacity", nullptr), 0u) << "the scan was finished";
   EXPECT_EQ(tvxsim_open_handles(), 0u);
+}
+
+TEST_F(Lifecycle, UnloadInTheMiddleOfALongScanDoesNotWaitForItsEnd) {
+  useScenario(R"({"cards": [{"model": "TVX1", "serial_number": "SN1", "ports": [
+    {"wwpn": "10:00:02:54:56:0C:30:01", "targets": [{"wwpn": "50:0C:0F:F1:2A:00:10:01",
+     "luns": {"count": 100000}}]}]}]})");
+  addFault(R"({"call": ["HBA_SendScsiInquiry", "HBA_SendReadCapacity"], "delay_ms": 1})");
+  tvxsim_forget_calls();
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 1u);
+  while (tvxsim_calls("HBA_SendReadCapacity", nullptr) < 5) std::this_thread::yield();
+  unload();
+  const unsigned long scanned = tvxsim_calls("HBA_SendReadCapacity", nullptr);
+  EXPECT_LT(scanned, 10'000u) << "at four commands of a millisecond a unit, all take minutes";
+  EXPECT_EQ(tvxsim_open_handles(), 0u);
+  std::this_thread::sleep_for(std::chrono::milliseconds(5));
+  EXPECT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), scanned) << "nobody scans any more";
+
+  // The next life is a whole one.
+  useScenario();
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 4u);
+  EXPECT_FALSE(instances("TVXHBA_StorageVolume").empty());
 }
 
 TEST_F(Lifecycle, RefusedInitialisationAnswersEveryClassEmpty) {

@@ -60,6 +60,26 @@ TEST_F(Readers, OfAnAdapterClassWaitForTheScanToEnd) {
   first.join();
 }
 
+TEST_F(Readers, OfSANClassesOnAStaleCacheWaitForTheNewScan) {
+  writeFile("etc/torvex_fc_provider.conf", "TVX_PROVIDER_REFRESH_SANDATA = FALSE\n");
+  const unsigned long units = 20;
+  useScenario(volumes(20));
+  load();
+  EXPECT_EQ(instances("TVXHBA_FCPort").size(),
+            1u);  // the SAN is not read yet: stale from the start
+  tvxsim_forget_calls();
+  addFault(R"({"call": "HBA_SendReadCapacity", "delay_ms": 1})");
+  std::vector<std::thread> clients;
+  for (const char* name : {"TVXHBA_StorageVolume", "TVXHBA_SCSIProtocolEndpoint",
+                           "TVXHBA_SCSIInitiatorTargetStorageVolumePath"})
+    clients.emplace_back([this, name, units] {
+      EXPECT_EQ(instances(name).size(), units) << name;
+      EXPECT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), units) << name;
+    });
+  for (std::thread& client : clients) client.join();
+  EXPECT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), units) << "one scan serves them all";
+}
+
 /// Calls every factory of the library once, by its long name.
 std::vector<void*> callFactories(void* library, host::Core& core,
                                  const std::vector<std::string>& names) {

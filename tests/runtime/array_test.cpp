@@ -59,6 +59,27 @@ TEST(Array, CopiesAreDeep) {
   EXPECT_EQ(c.size(), 2u);
 }
 
+TEST(Array, CopiesOfNothingTakeNoRoomUntilSomethingComesIn) {
+  const Array<String> nothing;
+  Array<String> a(nothing);
+  Array<String> b(nullptr, 0);
+  EXPECT_EQ(a.capacity(), 0u);
+  EXPECT_EQ(a.element(0), b.element(0));
+  a.clear();
+  a.resize(0, String());
+  EXPECT_TRUE(a.equal(nothing));
+  a.append("one");
+  EXPECT_EQ(a.capacity(), 1u);
+  EXPECT_EQ(b.size(), 0u);
+  b.resize(2, String("two"));
+  EXPECT_EQ(b[1], "two");
+  EXPECT_EQ(a[0], "one");
+  a = nothing;
+  EXPECT_EQ(a.capacity(), 0u);
+  a.prepend("three");
+  EXPECT_EQ(a[0], "three");
+}
+
 TEST(Array, CopiedStringsShareTheirRep) {
   const Array<String> a{"one"};
   const Array<String> b(a);

@@ -4,6 +4,7 @@
 
 #include <functional>
 #include <random>
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -142,6 +143,87 @@ TEST(InstanceMap, ClearEmptiesAndTheMapCanBeFilledAgain) {
   EXPECT_EQ(map.size(), 0u);
   EXPECT_EQ(map.find(make_device("a", 1).get()), Instance_Map_Base::npos);
   EXPECT_EQ(map.insert(make_device("a", 1).release()), 0u);
+}
+
+TEST(InstanceMap, TakesAnInstanceOverUnlessItsKeysAreThere) {
+  Instance_Map<T_Device> map;
+  Ref<Instance> device(make_device("a", 1).release());
+  EXPECT_EQ(map.take(device), 0u);
+  EXPECT_FALSE(device);
+  Ref<Instance> again(make_device("a", 1).release());
+  EXPECT_EQ(map.take(again), Instance_Map_Base::npos);
+  EXPECT_TRUE(again);
+  EXPECT_EQ(map.size(), 1u);
+  map[0]->Number.set(2u);
+  EXPECT_EQ(map.take(again), 1u) << "an entry that was fetched is looked at again";
+  EXPECT_EQ(map.find(make_device("a", 2).get()), 0u);
+}
+
+TEST(InstanceMap, RoomMadeBeforehandChangesNothingElse) {
+  Instance_Map<T_Device> map;
+  for (std::uint32_t i = 0; i < 5; ++i) map.insert(make_device("a", i).release());
+  map.reserve(1000);
+  map.reserve(2);
+  for (std::uint32_t i = 5; i < 1500; ++i) map.insert(make_device("a", i).release());
+  for (std::uint32_t i = 0; i < 1500; ++i)
+    ASSERT_EQ(map.find(make_device("a", i).get()), std::size_t{i});
+}
+
+TEST(InstanceMap, ShortenDestroysTheLastEntries) {
+  Instance_Map<T_Device> map;
+  for (std::uint32_t i = 0; i < 100; ++i) map.insert(make_device("a", i).release());
+  map[90]->Number.set(900u);  // checked again, but gone by then
+  map[10]->Number.set(1000u);
+  map.shorten(200);
+  EXPECT_EQ(map.size(), 100u);
+  map.shorten(60);
+  map.shorten(40);
+  EXPECT_EQ(map.size(), 40u);
+  EXPECT_EQ(map.find(make_device("a", 39).get()), 39u);
+  EXPECT_EQ(map.find(make_device("a", 1000).get()), 10u);
+  EXPECT_EQ(map.find(make_device("a", 40).get()), Instance_Map_Base::npos);
+  EXPECT_EQ(map.insert(make_device("a", 40).release()), 40u);
+  EXPECT_EQ(map.find(make_device("a", 40).get()), 40u);
+  map.shorten(0);
+  EXPECT_EQ(map.find(make_device("a", 1).get()), Instance_Map_Base::npos);
+  EXPECT_EQ(map.insert(make_device("a", 1).release()), 0u);
+}
+
+struct Drained {
+  std::vector<std::uint32_t> numbers;
+  std::size_t wanted;
+};
+
+bool keep_number(Instance* instance, std::int32_t, void* data) {
+  const Ref<Instance> owner(instance);
+  auto& drained = *static_cast<Drained*>(data);
+  drained.numbers.push_back(static_cast<T_Device*>(instance)->Number.value);
+  if (drained.wanted == 0) throw std::runtime_error("no more");
+  return drained.numbers.size() < drained.wanted;
+}
+
+TEST(InstanceMap, DrainDeliversClonesAndLeavesNothing) {
+  Instance_Map<T_Device> map;
+  for (std::uint32_t i = 0; i < 3; ++i) map.insert(make_device("a", i).release());
+  Drained all{{}, 10};
+  map.drain({keep_number, &all});
+  EXPECT_EQ(all.numbers, (std::vector<std::uint32_t>{0, 1, 2}));
+  EXPECT_EQ(map.size(), 0u);
+  for (std::uint32_t i = 0; i < 3; ++i) map.insert(make_device("a", i).release());
+  Drained two{{}, 2};
+  map.drain({keep_number, &two});
+  EXPECT_EQ(two.numbers.size(), 2u);
+  EXPECT_EQ(map.size(), 0u);
+}
+
+TEST(InstanceMap, DrainThatIsBrokenOffLeavesNothingToo) {
+  Instance_Map<T_Device> map;
+  for (std::uint32_t i = 0; i < 3; ++i) map.insert(make_device("a", i).release());
+  Drained none{{}, 0};
+  EXPECT_THROW(map.drain({keep_number, &none}), std::runtime_error);
+  EXPECT_EQ(none.numbers.size(), 1u);
+  EXPECT_EQ(map.size(), 0u);
+  EXPECT_EQ(map.find(make_device("a", 1).get()), Instance_Map_Base::npos);
 }
 
 TEST(InstanceMap, FindsAnEntryWhoseKeyWasChangedInPlace) {
