@@ -1,6 +1,7 @@
-// bench_san [build|classes] [units...]: what many logical units cost, as Markdown tables. Without
-// arguments 1,000, 10,000 and 100,000 units are measured, which takes about five minutes and two
-// gigabytes; "build" leaves the classes out, "classes" all else.
+// bench_san [build|classes] [once] [units...]: what many logical units cost, as Markdown tables.
+// Without arguments 1,000, 10,000 and 100,000 units are measured, which takes about five minutes
+// and two gigabytes; "build" leaves the classes out, "classes" all else; "once" is for tools that
+// count instructions and need no medians.
 #include <time.h>
 #include <unistd.h>
 
@@ -27,8 +28,13 @@
 namespace tvx::bench {
 namespace {
 
-constexpr int SERIES = 3;  ///< of all sizes in turn; the median counts
-constexpr int ROUNDS = 5;  ///< of one size in a series; the median counts
+/// How often what is measured.
+struct Repetitions {
+  int series = 3;  ///< of all sizes in turn; the median counts
+  int rounds = 5;  ///< of one size in a series; the median counts
+};
+
+Repetitions repetitions;
 
 std::string number(double value, int digits) {
   char text[32];
@@ -62,7 +68,7 @@ template <class Work, class Prepare = void (*)()>
 double middleTime(
     const Work& work, const Prepare& prepare = [] {}) {
   std::vector<double> times;
-  for (int round = 0; round < ROUNDS; round++) {
+  for (int round = 0; round < repetitions.rounds; round++) {
     prepare();
     coolCaches();
     const double start = processorTime();
@@ -266,7 +272,7 @@ Rows middleRows(const std::vector<Rows>& series) {
 std::vector<Rows> measureInTurn(const std::vector<std::size_t>& sizes,
                                 const std::function<Rows(std::size_t)>& measure) {
   std::vector<std::vector<Rows>> found(sizes.size());
-  for (int series = 0; series < SERIES; series++)
+  for (int series = 0; series < repetitions.series; series++)
     for (std::size_t i = 0; i < sizes.size(); i++)
       found[i].push_back(inChild([&] { return measure(sizes[i]); }));
   std::vector<Rows> middle;
@@ -327,7 +333,12 @@ int run(int count, char** arguments) {
   for (int i = 1; i < count; i++) {
     const std::size_t units = std::strtoul(arguments[i], nullptr, 10) / 10 * 10;
     if (units > 0) sizes.push_back(units);
-    if (units == 0) part = arguments[i];
+    if (units > 0) continue;
+    if (std::string(arguments[i]) == "once") {
+      repetitions = {1, 1};
+    } else {
+      part = arguments[i];
+    }
   }
   if (sizes.empty()) sizes = {1'000, 10'000, 100'000};
   if (part != "classes") printBuild(sizes);
