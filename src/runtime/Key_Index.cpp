@@ -13,6 +13,9 @@ namespace cimrt {
 namespace {
 
 constexpr std::size_t FIRST_SLOTS = 16;
+/// Enough for an association and its ends, and for most maps.
+constexpr std::size_t USUAL_NODES = 8;
+constexpr std::size_t USUAL_SHAPES = 4;
 
 /// Running hash; equal sequences of words give equal results.
 class Hash {
@@ -166,6 +169,8 @@ Key_Index::Entry Key_Index::describe(const Instance* instance) {
   while (s < _shapes.size() && !hash_keys(_shapes[s].shape, instance, Fit::EXACT, hash)) ++s;
   if (s == _shapes.size()) {
     Key_Shape shape;
+    shape.reserve(USUAL_NODES);
+    if (_shapes.empty()) _shapes.reserve(USUAL_SHAPES);
     add_shape(shape, instance);
     hash_keys(shape, instance, Fit::EXACT, hash);
     _shapes.push_back({std::move(shape), 0});
