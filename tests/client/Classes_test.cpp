@@ -56,6 +56,20 @@ class ClassesTest : public ::testing::Test {
     return result;
   }
 
+  /// What is printed behind its name of the instance that `gi` answers.
+  static std::string got(const WbemcliTexts& texts, const std::string& name) {
+    const std::string input = texts.asInput(name);
+    const WbemcliAnswer answer = wbemcli({"gi", input});
+    EXPECT_EQ(answer.exitCode, 0) << name << ": " << answer.text;
+    const std::vector<std::string> one = instances(answer);
+    const std::string asked = input.substr(std::string("http://").size());
+    if (one.size() != 1 || !one[0].starts_with(asked + " ")) {
+      ADD_FAILURE() << "not one instance of the name asked for: " << answer.text;
+      return {};
+    }
+    return one[0].substr(asked.size());
+  }
+
   static FilledHost* s_Host;
 };
 
@@ -84,13 +98,14 @@ TEST_F(ClassesTest, GetAnswersWhatEnumerateAnswers) {
       ASSERT_TRUE(enumerated[i].starts_with(all[i] + " ")) << all[i] << "\n" << enumerated[i];
     }
     for (std::size_t i = 0; i < std::min(all.size(), perClass); ++i) {
-      const WbemcliAnswer got = wbemcli({"gi", texts.asInput(all[i])});
-      ASSERT_EQ(got.exitCode, 0) << all[i] << ": " << got.text;
-      const std::vector<std::string> one = instances(got);
-      ASSERT_EQ(one.size(), 1u) << got.text;
-      const std::string asked = texts.asInput(all[i]).substr(std::string("http://").size());
-      ASSERT_TRUE(one[0].starts_with(asked + " ")) << one[0];
-      EXPECT_EQ(one[0].substr(asked.size()), enumerated[i].substr(all[i].size())) << all[i];
+      std::string gotten = got(texts, all[i]);
+      std::string listed = enumerated[i].substr(all[i].size());
+      if (gotten != listed) {
+        // Counters may have been read anew between the two; they are not within ten seconds again.
+        listed = instances(wbemcli({"ei", url(*each)})).at(i).substr(all[i].size());
+        gotten = got(texts, all[i]);
+      }
+      EXPECT_EQ(gotten, listed) << all[i];
     }
   }
 }
