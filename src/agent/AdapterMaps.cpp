@@ -42,10 +42,15 @@ constexpr Build_Step<Port_Build> PORT_STEPS[] = {
 
 std::int32_t buildPort(Adapter_Build& adapter, int position) {
   TVX_LOG(TVX_DBG, "Creating classes for port %d.", position);
-  // A port of another kind cannot stand under an FC adapter: the cast throws.
-  auto& port = dynamic_cast<FCPort&>(*adapter.adapter.getPort(position));
-  auto& attributes = dynamic_cast<const FCPortAttributes&>(*port.getAttributes());
-  Port_Build build{adapter, port, attributes};
+  auto* port = dynamic_cast<FCPort*>(adapter.adapter.getPort(position));
+  const auto* attributes =
+      port ? dynamic_cast<const FCPortAttributes*>(port->getAttributes()) : nullptr;
+  if (!attributes) {
+    TVX_LOG(TVX_ERR, "Port %d of adapter [%s] is no FC port", position,
+            adapter.adapter.getName().c_str());
+    return MAP_BUILD_FAILED;
+  }
+  Port_Build build{adapter, *port, *attributes};
   const std::int32_t result = runSteps(PORT_STEPS, build);
   return result == MAP_BUILD_LEAVE_PORT ? 0 : result;
 }
@@ -72,9 +77,13 @@ std::int32_t buildAdapter(Host_Build& host, std::uint32_t index) {
     TVX_LOG(TVX_DBG, "Skippping Non FC Adapter [%s]", adapter.getName().c_str());
     return 0;
   }
-  auto& fcAdapter = dynamic_cast<FCAdapter&>(adapter);
-  auto& attributes = dynamic_cast<const FCAdapterAttributes&>(*adapter.getAttributes());
-  Adapter_Build build{host, fcAdapter, attributes, index};
+  auto* fcAdapter = dynamic_cast<FCAdapter*>(&adapter);
+  const auto* attributes = dynamic_cast<const FCAdapterAttributes*>(adapter.getAttributes());
+  if (!fcAdapter || !attributes) {
+    TVX_LOG(TVX_ERR, "Adapter [%s] is no FC adapter", adapter.getName().c_str());
+    return MAP_BUILD_FAILED;
+  }
+  Adapter_Build build{host, *fcAdapter, *attributes, index};
   return runSteps(ADAPTER_STEPS, build);
 }
 

@@ -1,4 +1,6 @@
 // Host, packages, cards, chips and connectors after a refresh, and what a failed build leaves.
+#include <utility>
+
 #include "Map_Test.h"
 
 namespace cimrt::test {
@@ -256,6 +258,36 @@ TEST_F(Adapter_Maps, AdapterOfAnotherKindIsPassedOver) {
   }
   EXPECT_EQ(log.count("Skippping Non FC Adapter [Torvex-TVX16002-1]"), 1u);
   EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 3u);
+}
+
+TEST_F(Adapter_Maps, AdapterThatIsNoFCAdapterEndsTheBuild) {
+  ProviderAgent& agent = build();
+  Ranked_Lock maps(agent.m_AdapterMapsReadyMutex);
+  Ranked_Lock data(agent.m_DataMutex);
+  agent.m_pData->m_Adapters.push_back(new Odd_Adapter);
+  agent.m_pData->m_AdapterCount++;
+  log.clear();
+  EXPECT_EQ(agent.updateAdapterMaps(), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level("Adapter [odd] is no FC adapter"), TVX_ERR);
+  EXPECT_EQ(log.count("Unknown Exception in FC card discovery"), 0u);
+  EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 4u);
+  EXPECT_EQ(agent.m_TVXHBA_RecordLog_map.size(), 0u);
+}
+
+TEST_F(Adapter_Maps, PortThatIsNoFCPortEndsTheBuildWithWhatThereIs) {
+  ProviderAgent& agent = build();
+  Ranked_Lock maps(agent.m_AdapterMapsReadyMutex);
+  Ranked_Lock data(agent.m_DataMutex);
+  Port*& place = agent.m_pData->m_Adapters[2]->getPorts().at(0);
+  Port* const port = std::exchange(place, nullptr);
+  log.clear();
+  EXPECT_EQ(agent.updateAdapterMaps(), MAP_BUILD_FAILED);
+  place = port;
+  EXPECT_EQ(log.level("Port 0 of adapter [" + agent.m_pData->m_Adapters[2]->getName() +
+                      "] is no FC port"),
+            TVX_ERR);
+  EXPECT_EQ(log.count("Unknown Exception in FC card discovery"), 0u);
+  EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 2u);
 }
 
 TEST_F(Adapter_Maps, LostTreeIsASeriousIssue) {

@@ -90,21 +90,6 @@ TEST_F(San_Steps, CountBeyondTheAdaptersEndsTheBuild) {
   EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 2u);
 }
 
-/// An adapter of no class that the builders know, which says that it is an FC adapter.
-class Odd_Adapter : public Adapter {
- public:
-  Odd_Adapter() : Adapter("odd", 0, TVX_ADAPTER_TYPE_FC) {}
-  const std::string& getName() const override { return m_Name; }
-  const std::int32_t& getNumber() const override { return m_Number; }
-  const std::uint32_t& getFunctionType() const override { return m_FunctionType; }
-  AdapterAttributes* getAttributes() override { return nullptr; }
-  AdapterStatistics* getStatistics() override { return nullptr; }
-  std::size_t getNumberOfPorts() override { return 0; }
-  std::vector<Port*>& getPorts() override { return m_Ports; }
-  Port* getPort(int) override { return nullptr; }
-  void rescanTargets() override {}
-};
-
 TEST_F(San_Steps, AdapterThatIsNoFCAdapterEndsTheBuild) {
   ProviderAgent& agent = buildUnits(R"({"count": 2})");
   agent.m_pData->m_Adapters.push_back(new Odd_Adapter);
