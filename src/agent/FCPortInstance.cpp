@@ -122,11 +122,9 @@ std::int32_t buildPortStatistics(Port_Build& build) {
 
 std::int32_t offerAccessPoint(Port_Build& build) {
   const Host_Build& host = build.adapter.host;
-  if (!host.accessPoint) return 0;
-  return associate(host.agent.m_TVXHBA_SAPAvailableForElement_map, host.accessPoint, build.fcPort,
-                   "Insert Failed : m_TVXHBA_SAPAvailableForElement_map")
-             ? 0
-             : MAP_BUILD_FAILED;
+  associate(host.agent.m_TVXHBA_SAPAvailableForElement_map, host.accessPoint, build.fcPort,
+            "Insert Failed : m_TVXHBA_SAPAvailableForElement_map");
+  return 0;
 }
 
 }  // namespace cimrt

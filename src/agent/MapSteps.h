@@ -50,7 +50,7 @@ std::int32_t insertFCPort(Port_Build& build);
 std::int32_t associateFCPort(Port_Build& build);
 /// Its statistics, unset until they are first read.
 std::int32_t buildPortStatistics(Port_Build& build);
-/// The management page's access point, for the port, if there is one.
+/// The management page's access point, for the port, if there is one. Never a failure of the build.
 std::int32_t offerAccessPoint(Port_Build& build);
 
 // --- Port (PortConformance.cpp). Failures are logged and not looked at.
