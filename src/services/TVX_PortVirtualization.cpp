@@ -86,18 +86,21 @@ std::int32_t buildPool(Physical_Port& physical, std::uint32_t count) {
       "HostedResource Pool created and inserted in map");
 }
 
-/// The name text of a virtual port, if the library gives its attributes.
-void setName(TVXHBA_VirtualFCPort& virtualPort, const Physical_Port& physical,
-             const HBA_WWN& name) {
+/// The attributes of a virtual port; null when the library does not give them.
+TVX_Block readAttributes(const Physical_Port& physical, const HBA_WWN& name) {
   TVX_Block block;
   const RM_STATUS status = TVX_MethodWrapper::ListVPortAttributes(&physical.wwpn, name, &block);
-  if (status != RM_OK) {
+  if (status != RM_OK)
     TVX_LOG(TVX_DBG,
             "TVXUCNA_PortVirtualization::Failure in listing vports information for port: %s, Rm "
             "Error: %d",
             physical.deviceID, status);
-    return;
-  }
+  return block;
+}
+
+/// The name text among the attributes, if there are any.
+void setName(TVXHBA_VirtualFCPort& virtualPort, const TVX_Block& block) {
+  if (!block) return;
   const auto* attributes = reinterpret_cast<const RM_VPortAttributes*>(block.get());
   virtualPort.VPortName.set(
       String(attributes->name, strnlen(attributes->name, sizeof attributes->name)));
@@ -140,9 +143,10 @@ std::int32_t buildVirtualPort(Physical_Port& physical, const RM_VPortEntry& entr
   TVX_LOG(TVX_DBG, "VPort Id :%s Node name: %s", wwpn.c_str(), wwnn.c_str());
   HBA_WWN name{};
   if (!convertName(wwpn.c_str(), name, TVX_DBG)) return VPORT_FAILED;
+  const TVX_Block attributes = readAttributes(physical, name);
   const auto make = [&] {
     Ref<TVXHBA_VirtualFCPort> made = makeVirtualPort(physical, wwpn, wwnn, entry.fcId);
-    setName(*made, physical, name);
+    setName(*made, attributes);
     return made;
   };
   auto& map = physical.agent.m_TVXHBA_VirtualFCPort_map;

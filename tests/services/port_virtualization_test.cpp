@@ -269,6 +269,19 @@ TEST_F(Port_Virtualization, ALackOfMemoryIsToldForEachClass) {
   }
 }
 
+TEST_F(Port_Virtualization, AttributesAreReadBeforeThePortIsMade) {
+  ProviderAgent& agent = build(TWO);
+  Ranked_Lock data(agent.m_DataMutex);
+  log.clear();
+  constexpr const char* REFUSED = "Failed to create VirtualFCPort";
+  {
+    const Failing_New failing(TVXHBA_VirtualFCPort::static_meta_class.size);
+    EXPECT_EQ(TVX_PortVirtualization::CreatePortVirtualizationClasses(agent), VPORT_NO_INSTANCE);
+  }
+  const std::vector<std::string> steps = {"VPort Name guest-one ", REFUSED};
+  EXPECT_EQ(log.only(steps), steps);
+}
+
 TEST_F(Port_Virtualization, PortsOfOneNameAreRefusedTheSecondPool) {
   ProviderAgent& agent = build(TWO);
   Ranked_Lock data(agent.m_DataMutex);
