@@ -116,8 +116,12 @@ TEST_F(Transceivers, EveryFieldIsLogged) {
       "TxBiasCurrent: 6.75   mA",
       "TxPower: 0.50   mW",
       "RxPower: 0.25   mW",
+      "Success...",
   };
-  EXPECT_EQ(log.only(texts), texts);
+  // The programs in the flash, which are read next, end with the same text.
+  std::vector<std::string> wanted = texts;
+  wanted.push_back("Success...");
+  EXPECT_EQ(log.only(texts), wanted);
 }
 
 TEST_F(Transceivers, TiesTheController) {
