@@ -1,6 +1,8 @@
 // When the cache is rebuilt, what a run of the thread does, and that nobody waits for ever.
 #include <chrono>
+#include <cstring>
 #include <thread>
+#include <utility>
 
 #include "Agent_Fixture.h"
 #include "model/TVX_Data.h"
@@ -81,6 +83,58 @@ TEST_F(Refresh, FirstRunBuildsAdaptersAndSAN) {
   EXPECT_FALSE(agent.m_bIsSANMapsBuilding);
   EXPECT_FALSE(agent.m_bAdapterRefreshPending);
   EXPECT_EQ(log.count(JOIN), 0u);
+}
+
+/// Notes which groups are ready, and which is being built, when the thread logs certain lines.
+class Readiness_Record : public TVX_LoggerInterface {
+ public:
+  explicit Readiness_Record(const ProviderAgent& agent) : m_Agent(agent) {
+    getLogger().registerInterface(this);
+  }
+  ~Readiness_Record() override { getLogger().unregisterInterface(this); }
+  Readiness_Record(const Readiness_Record&) = delete;
+  Readiness_Record& operator=(const Readiness_Record&) = delete;
+
+  void log(int, const char*, const unsigned*, const char* text) override {
+    for (const char* moment : {BEGIN, "buildAdapterData", ADAPTER_MAPS, SAN_DATA, SAN_MAPS})
+      if (std::strcmp(moment, text) == 0) m_Moments.push_back(now());
+  }
+  void open() override {}
+  void close() override {}
+  void clear() override {}
+
+  /// Adapter data, adapter maps, SAN maps: "r" ready, "b" being built, "-" neither.
+  std::vector<std::string> take() { return std::exchange(m_Moments, {}); }
+  std::string now() const {
+    EXPECT_FALSE(m_Agent.m_bIsAdapterDataReady && m_Agent.m_bIsAdapterDataBuilding);
+    EXPECT_FALSE(m_Agent.m_bIsAdapterMapsReady && m_Agent.m_bIsAdapterMapsBuilding);
+    EXPECT_FALSE(m_Agent.m_bIsSANMapsReady && m_Agent.m_bIsSANMapsBuilding);
+    return {sign(m_Agent.m_bIsAdapterDataReady, m_Agent.m_bIsAdapterDataBuilding),
+            sign(m_Agent.m_bIsAdapterMapsReady, m_Agent.m_bIsAdapterMapsBuilding),
+            sign(m_Agent.m_bIsSANMapsReady, m_Agent.m_bIsSANMapsBuilding)};
+  }
+
+ private:
+  static char sign(bool ready, bool building) { return building ? 'b' : ready ? 'r' : '-'; }
+  const ProviderAgent& m_Agent;
+  std::vector<std::string> m_Moments;
+};
+
+TEST_F(Refresh, ReadinessMovesFromGroupToGroup) {
+  ProviderAgent& agent = startAgent();
+  Readiness_Record readiness(agent);
+  refresh(agent);
+  using Moments = std::vector<std::string>;
+  EXPECT_EQ(readiness.take(), (Moments{"---", "b--", "rb-", "rr-", "rrb"}));
+  EXPECT_EQ(readiness.now(), "rrr");
+  // Until the next run clears them, readers are served from the old maps; those of the SAN stand
+  // until the adapters' are rebuilt.
+  refresh(agent);
+  EXPECT_EQ(readiness.take(), (Moments{"rrr", "b-r", "rb-", "rr-", "rrb"}));
+  agent.m_bSANRefreshSetting = false;
+  refresh(agent);
+  EXPECT_EQ(readiness.take(), (Moments{"rrr", "b-r", "rb-"}));
+  EXPECT_EQ(readiness.now(), "rr-");
 }
 
 TEST_F(Refresh, FurtherRunsJoinTheOneBefore) {
