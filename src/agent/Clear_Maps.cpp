@@ -4,20 +4,13 @@
 #include <cstdlib>
 #include <iterator>
 
+#include "agent/Clear_Map.h"
 #include "agent/ProductSteps.h"
 #include "agent/ProviderAgent.h"
 
 namespace cimrt {
 
 namespace {
-
-/// Empties one map, named by its member pointer.
-using Clear_Map = void (*)(Agent_Maps& maps);
-
-template <auto MEMBER>
-void clearMap(Agent_Maps& maps) {
-  (maps.*MEMBER).clear();
-}
 
 /// Host, ports and controllers.
 constexpr Clear_Map CORE[] = {

@@ -5,18 +5,12 @@
 
 #include "access/TVX_AttributeReader.h"
 #include "access/TVX_MethodWrapper.h"
+#include "agent/Clear_Map.h"
 #include "common/CLogger.h"
 
 namespace cimrt {
 
 namespace {
-
-using Clear_Map = void (*)(Agent_Maps& maps);
-
-template <auto MEMBER>
-void clearMap(Agent_Maps& maps) {
-  (maps.*MEMBER).clear();
-}
 
 constexpr Clear_Map CLASSES[] = {
     clearMap<&Agent_Maps::m_TVXHBA_FCHBADiagnosticTest_map>,
