@@ -110,6 +110,23 @@ TEST_F(Platform, ComputerSystemOfThePlatformConformsToNothing) {
   EXPECT_EQ(agent.m_TVXHBA_FCPortConformsToProfile_map.size(), 16u);
 }
 
+TEST_F(Platform, SystemThatWasGeneratedOnceLetsAllLaterOnesConform) {
+  ProviderAgent& agent = buildHere();
+  ASSERT_TRUE(agent.m_bOwnComputerSystem);
+  // The platform's provider comes up after the first refresh.
+  addSystem("vios1");
+  log.clear();
+  Ranked_Lock maps(agent.m_AdapterMapsReadyMutex);
+  Ranked_Lock data(agent.m_DataMutex);
+  EXPECT_EQ(agent.updateAdapterMaps(), 0);
+  EXPECT_EQ(text(agent.m_CIM_ComputerSystem_map[0]->Name), "vios1");
+  EXPECT_TRUE(agent.m_bOwnComputerSystem);
+  ASSERT_EQ(agent.m_TVXHBA_ComputerSystemConformsToProfile_map.size(), 13u);
+  EXPECT_TRUE(ties(*agent.m_TVXHBA_ComputerSystemConformsToProfile_map[0],
+                   agent.m_TVXHBA_RegisteredProfile_map[0], agent.m_CIM_ComputerSystem_map[0]));
+  EXPECT_EQ(log.count("This is IBM/VMWare comp Sys - do nothing"), 0u);
+}
+
 TEST_F(Platform, ChassisOfThePlatformHoldsTheCardsAndGoesIntoNoMap) {
   addSystem("vios1");
   addChassis("frame 7");
