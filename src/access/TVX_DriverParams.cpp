@@ -22,10 +22,16 @@ constexpr const char* LOCAL_FAILED = "RM_GetDriverParams:failed";
 constexpr const char* NO_BUFFER =
     "ERROR: tvxcimGetDriverParamsGlobal: Unable to allocate buffer";  // for either scope
 
-/// Room for so many parameters; null without memory, or for a count that can't be true.
-TVX_Block allocateParams(std::uint32_t count) {
-  if (count > MAX_COUNT) return nullptr;
-  return tvxAllocate(std::max<std::size_t>(count, 1) * sizeof(RM_DriverParam));
+/// Room for so many parameters, in the place of what was there. Missing memory, or a count that
+/// can't be true, is logged with the text.
+RM_STATUS allocate(std::uint32_t count, const char* text, TVX_Driver_Params& params) {
+  params.block.reset();
+  if (count <= MAX_COUNT)
+    params.block = tvxAllocate(std::max<std::size_t>(count, 1) * sizeof(RM_DriverParam));
+  params.count = params.room = params.block ? count : 0;
+  if (params.block) return RM_OK;
+  TVX_LOG(TVX_CRIT, "%s", text);
+  return RM_ERROR_NO_MEMORY;
 }
 
 RM_STATUS callLibrary(TVX_Driver_Scope scope, const HBA_WWN& wwpn, TVX_Driver_Params& params) {
@@ -52,33 +58,29 @@ RM_STATUS logFailure(TVX_Driver_Scope scope, const char* call, RM_STATUS status)
   return status;
 }
 
-RM_STATUS logNoRoom(const char* text) {
-  TVX_LOG(TVX_CRIT, "%s", text);
-  return RM_ERROR_NO_MEMORY;
-}
-
 bool needsMoreRoom(RM_STATUS status) {
   return status == RM_ERROR_MORE_DATA || status == RM_ERROR_LIST_TOO_SMALL;
 }
 
 }  // namespace
 
+RM_STATUS TVX_MethodWrapper::AllocateDriverParams(TVX_Driver_Params* params) {
+  return allocate(FIRST_COUNT, NO_BUFFER, *params);
+}
+
 RM_STATUS TVX_MethodWrapper::ReadDriverParams(const HBA_WWN& wwpn, TVX_Driver_Scope scope,
                                               TVX_Driver_Params* params) {
-  TVX_Driver_Params read{allocateParams(FIRST_COUNT), FIRST_COUNT};
-  if (!read.block) return logNoRoom(NO_BUFFER);
-  std::uint32_t room = FIRST_COUNT;
-  RM_STATUS status = callLibrary(scope, wwpn, read);
+  if (!params->block && AllocateDriverParams(params) != RM_OK) return RM_ERROR_NO_MEMORY;
+  params->count = params->room;
+  RM_STATUS status = callLibrary(scope, wwpn, *params);
   if (status != RM_OK && !needsMoreRoom(status)) return logFailure(scope, "b", status);
   if (needsMoreRoom(status)) {
-    room = read.count;
-    read.block = allocateParams(room);
-    if (!read.block) return logNoRoom(scope == TVX_Driver_Scope::LOCAL ? LOCAL_FAILED : NO_BUFFER);
-    status = callLibrary(scope, wwpn, read);
+    const char* text = scope == TVX_Driver_Scope::LOCAL ? LOCAL_FAILED : NO_BUFFER;
+    if (allocate(params->count, text, *params) != RM_OK) return RM_ERROR_NO_MEMORY;
+    status = callLibrary(scope, wwpn, *params);
     if (status != RM_OK) return logFailure(scope, "a", status);
   }
-  read.count = std::min(read.count, room);
-  *params = std::move(read);
+  params->count = std::min(params->count, params->room);
   return RM_OK;
 }
 

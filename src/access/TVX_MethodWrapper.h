@@ -50,6 +50,7 @@ enum class TVX_Driver_Scope { LOCAL, GLOBAL };
 struct TVX_Driver_Params {
   TVX_Block block;          ///< `count` records of `RM_DriverParam`
   std::uint32_t count = 0;  ///< never more than the block holds
+  std::uint32_t room = 0;   ///< records that the block holds
   const RM_DriverParam& operator[](std::uint32_t i) const {
     return reinterpret_cast<const RM_DriverParam*>(block.get())[i];
   }
@@ -132,10 +133,13 @@ class TVX_MethodWrapper {
   /// other indicator
   static int SetBeaconState(const HBA_WWN& wwpn, std::uint16_t indicator);
 
+  /// Room for as many parameters as a driver has as a rule. RM_ERROR_NO_MEMORY is logged.
+  static RM_STATUS AllocateDriverParams(TVX_Driver_Params* params);
   /// The parameters of the driver, for one port or for all, asked for through a port. Status 7 or
   /// 191 has the list read once more with the room that it needs. The status, or
   /// RM_ERROR_NO_MEMORY; each failure is logged.
-  /// @param params left as it was on failure
+  /// @param params its block is used again, and is made if there is none; without meaning on
+  /// failure
   static RM_STATUS ReadDriverParams(const HBA_WWN& wwpn, TVX_Driver_Scope scope,
                                     TVX_Driver_Params* params);
   /// Sets one parameter.

@@ -136,9 +136,8 @@ void takeCurrent(Instance_Map<T>& map, const std::string& instanceID,
 }
 
 /// False if the port can't be read.
-bool updatePort(ProviderAgent& agent, const Port& port) {
+bool updatePort(ProviderAgent& agent, const Port& port, TVX_Driver_Params& params) {
   HBA_WWN wwpn{};
-  TVX_Driver_Params params;
   if (TVX_MethodWrapper::string2HBAName(&wwpn, port.m_Name.c_str()) == 0) return false;
   if (TVX_MethodWrapper::ReadDriverParams(wwpn, TVX_Driver_Scope::LOCAL, &params) != RM_OK)
     return false;
@@ -148,10 +147,17 @@ bool updatePort(ProviderAgent& agent, const Port& port) {
   return true;
 }
 
+void updatePorts(ProviderAgent& agent) {
+  TVX_Driver_Params params;
+  if (TVX_MethodWrapper::AllocateDriverParams(&params) != RM_OK) return;
+  forEachFCPort(agent, [&](Adapter&, Port& port) { return updatePort(agent, port, params); });
+}
+
 void updateDriver(ProviderAgent& agent) {
+  TVX_Driver_Params params;
+  if (TVX_MethodWrapper::AllocateDriverParams(&params) != RM_OK) return;
   const Port* port = firstFCPort(agent);
   HBA_WWN wwpn{};
-  TVX_Driver_Params params;
   if (!port || TVX_MethodWrapper::string2HBAName(&wwpn, port->m_Name.c_str()) == 0) return;
   if (TVX_MethodWrapper::ReadDriverParams(wwpn, TVX_Driver_Scope::GLOBAL, &params) != RM_OK) return;
   TVX_LOG(TVX_DBG, "number of driver parameters %d", static_cast<int>(params.count));
@@ -197,8 +203,7 @@ RM_STATUS tvxcimGetDriverParam(ProviderAgent& agent, const std::string& deviceId
 void updateLocalDriverParams(ProviderAgent& agent) {
   static Lasting<Live_Throttle> throttle(DRIVER_UPDATE_PERIOD);
   if (!startDriverUpdate(*throttle)) return;
-  containUpdate(
-      [&] { forEachFCPort(agent, [&](Adapter&, Port& port) { return updatePort(agent, port); }); });
+  containUpdate([&] { updatePorts(agent); });
 }
 
 void updateGlobalDriverParams(ProviderAgent& agent) {

@@ -483,6 +483,26 @@ TEST_F(Driver_Params, MemoryThatRunsOutInAnUpdateLeavesTheValues) {
   EXPECT_EQ(log.level(ALLOCATION), TVX_CRIT);
 }
 
+TEST_F(Driver_Params, MemoryIsAskedForOnceAndBeforeAnyName) {
+  ProviderAgent& agent = build();
+  allocationsLeft = 1;
+  tvxSetAllocator(someMemory);
+  Delivered both;
+  readLocal(agent, both);
+  EXPECT_EQ(log.count(ALLOCATION), 0u) << "one block serves both ports";
+  turnClock(5 * SECOND);
+  log.clear();
+  agent.m_pData->m_Adapters.at(0)->getPort(0)->m_Name = "nonsense";
+  tvxSetAllocator(noMemory);
+  Delivered local;
+  readLocal(agent, local);
+  Delivered global;
+  readGlobal(agent, global);
+  EXPECT_EQ(log.count(ALLOCATION), 2u);
+  EXPECT_EQ(log.level(ALLOCATION), TVX_CRIT);
+  EXPECT_EQ(log.count("INVALID WWN"), 0u);
+}
+
 TEST_F(Driver_Params, ExceptionEndsTheUpdateAndNotTheAnswer) {
   ProviderAgent& agent = build();
   tvxSetAllocator(throwing);
