@@ -61,9 +61,13 @@ TEST_F(StatsProgramTest, WatchesSoManySamples) {
 }
 
 TEST_F(StatsProgramTest, WatchingEndsWithASignalAndUnloadsTheLibrary) {
+  const std::string sample = (m_Temporary / "sample").string();
   const test::Outcome result = test::runShell(
-      "env -u TVX_ROOT -u TVX_SIM_STATE -u TVX_SIM_SCENARIO TMPDIR=" + m_Temporary.string() +
-      " timeout --preserve-status -s INT 1 " TVXCIM " --sim --strict stats --watch 60");
+      "(env -u TVX_ROOT -u TVX_SIM_STATE -u TVX_SIM_SCENARIO TMPDIR=" + m_Temporary.string() +
+      " " TVXCIM " --sim --strict stats --watch 3600 >" + sample +
+      " & child=$!; for i in $(seq 1200); do grep -q 'TX FRAMES/S' " + sample +
+      " && break; sleep 0.05; done; kill -TERM $child; wait $child; code=$?; cat " + sample +
+      "; exit $code)");
   EXPECT_EQ(result.exitCode, 0) << result.err;
   EXPECT_EQ(occurrences(result.out, "TX FRAMES/S"), 1U) << result.out;
 }

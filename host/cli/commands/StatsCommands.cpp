@@ -15,12 +15,6 @@
 namespace tvx::host {
 namespace {
 
-struct StatsWords {
-  std::string port;
-  double watch = 0;         ///< seconds between two samples; 0: one sample
-  std::uint64_t count = 0;  ///< samples with --watch; 0: until a signal comes
-};
-
 /// Keeps the signals that end a program from ending it while it lives, so that the library is
 /// unloaded as it should be: a pause notices them. Threads that start meanwhile leave them alone
 /// too. Once one has come, more of them (timeout(1) sends two) do not end the program either.
@@ -57,6 +51,14 @@ class EndingSignals {
   bool m_Came = false;
 };
 
+struct StatsWords {
+  std::string port;
+  double watch = 0;         ///< seconds between two samples; 0: one sample
+  std::uint64_t count = 0;  ///< samples with --watch; 0: until a signal comes
+  /// With --watch: from the moment that the word is read, which is before the library is loaded.
+  std::unique_ptr<EndingSignals> signals;
+};
+
 void printSample(Session& session, const std::string& wwpn, StatsRates& rates, bool watching) {
   const std::vector<StatsRow> rows =
       rates.add(statsSamples(instancesOf(session, "TVXHBA_FCPortStatistics"), wwpn));
@@ -70,13 +72,12 @@ void printSample(Session& session, const std::string& wwpn, StatsRates& rates, b
 
 ExitCode showStats(Session& session, const StatsWords& words) {
   const bool watching = words.watch > 0;
-  EndingSignals signals;
   const std::string wwpn =
       words.port.empty() ? std::string() : wwnText(findPort(session, words.port).text("DeviceID"));
   StatsRates rates;
   printSample(session, wwpn, rates, watching);
   for (std::uint64_t shown = 1; watching && (words.count == 0 || shown < words.count); ++shown) {
-    if (!signals.pause(words.watch)) {
+    if (!words.signals->pause(words.watch)) {
       break;
     }
     printSample(session, wwpn, rates, watching);
@@ -94,7 +95,10 @@ void addStatsCommands(CLI::App& app, const CommandChooser& choose) {
   stats->add_option("PORT", words->port, portWords);
   CLI::Option* watch =
       stats->add_option("--watch", words->watch, "seconds between two samples, with rates")
-          ->check(CLI::Range(shortest, aDay));
+          ->check(CLI::Range(shortest, aDay))
+          ->each([words = words.get()](const std::string&) {
+            words->signals = std::make_unique<EndingSignals>();
+          });
   stats->add_option("--count", words->count, "end after so many samples")
       ->needs(watch)
       ->check(CLI::PositiveNumber);
