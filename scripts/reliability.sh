@@ -3,7 +3,7 @@
 # call under AddressSanitizer and UBSan, then many clients at once under ThreadSanitizer and in a release build.
 #
 # usage: scripts/reliability.sh [EVERY] [SECONDS]   EVERY: one of so many cells of the fault matrix (default 1: all,
-#                                                   which takes an hour); SECONDS: of each soak (default 120)
+#                                                   which takes two hours and more); SECONDS: of each soak (default 120)
 set -euo pipefail
 . "$(dirname "$0")/lib.sh"
 
