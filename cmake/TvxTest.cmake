@@ -17,6 +17,8 @@ function(tvx_add_test name)
     set(T_TIMEOUT 300)
   endif()
   add_executable(${name} ${T_SOURCES})
+  # What is tested is optimised as it ships; the tests themselves are compiled for a short build.
+  target_compile_options(${name} PRIVATE $<$<CONFIG:Release>:-O1>)
   target_link_libraries(${name} PRIVATE ${T_LIBS} tvx_includes tvx_warnings GTest::gmock GTest::gtest_main
                         Threads::Threads)
   if(T_DEPENDS)
