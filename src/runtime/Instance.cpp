@@ -99,6 +99,10 @@ void* features_of(Instance* instance) {
   return instance + 1;
 }
 
+const void* features_of(const Instance* instance) {
+  return instance + 1;
+}
+
 std::size_t features_size(const Meta_Record* record) {
   return record->size - sizeof(Instance);
 }
@@ -211,7 +215,7 @@ Instance* clone(const Instance* instance) {
   const Meta_Record* record = instance->meta_class;
   Instance* copy = allocate(record);
   copy->__name_space = instance->__name_space;
-  std::memcpy(features_of(copy), instance + 1, features_size(record));
+  std::memcpy(features_of(copy), features_of(instance), features_size(record));
   std::uint64_t made = 0;
   try {
     for (; made < record->num_meta_features; ++made)
