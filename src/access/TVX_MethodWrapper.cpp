@@ -266,6 +266,8 @@ RM_STATUS readOsInfo(const void* block, char* osInfo) {
     return RM_ERROR;
   }
   const std::uint8_t* const attr = attribute.value;
+  // The message is the condition's own text.
+  // cppcheck-suppress incorrectStringBooleanError
   CIMRT_ASSERT("NULL check on " && attr);
   std::strncpy(osInfo, attributeText(attribute).c_str(), TVX_OS_INFO_SIZE);
   return RM_OK;
