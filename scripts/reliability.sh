@@ -3,7 +3,7 @@
 # call under AddressSanitizer and UBSan, then many clients at once under ThreadSanitizer and in a release build.
 #
 # usage: scripts/reliability.sh [EVERY] [SECONDS]   EVERY: one of so many cells of the fault matrix (default 1: all,
-#                                                   which takes two hours and more); SECONDS: of each soak (default 120)
+#                                                   an hour and more on two processors); SECONDS: of each soak (default 120)
 set -euo pipefail
 . "$(dirname "$0")/lib.sh"
 
@@ -18,7 +18,7 @@ run() { LD_LIBRARY_PATH="$root/build/$1/lib" "$root/build/$1/bin/$2" "${@:3}"; }
 
 step "fault matrix, one of $every cells (asan)"
 configure_and_build asan fault_matrix
-run asan fault_matrix --every "$every" --report "$reports/matrix.md"
+run asan fault_matrix --every "$every" --jobs "$(nproc)" --report "$reports/matrix.md"
 step "soak for $seconds s (tsan)"
 configure_and_build tsan soak
 run tsan soak --seconds "$seconds" --strict --report "$reports/soak_tsan.md"

@@ -2,9 +2,10 @@
 // it can fail, while a client asks for everything. The rows run in child processes, so that a crash
 // or a hang is an outcome and not the end.
 //
-// usage: fault_matrix [--every N] [--row TEXT] [--report FILE] [--seconds N]
+// usage: fault_matrix [--every N] [--row TEXT] [--jobs N] [--report FILE] [--seconds N]
 //   --every N     of each N cells one, another in each row (1: the whole matrix)
 //   --row TEXT    only entry points whose name holds the text
+//   --jobs N      so many rows at once (default 1)
 //   --report FILE the table in Markdown
 //   --seconds N   a cell that takes longer hangs (default 60)
 // Ends with 1 if a cell crashed, hung or leaked.
@@ -12,14 +13,17 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <csignal>
+#include <cstdio>
 #include <cstdlib>
 #include <fstream>
 #include <iostream>
 #include <nlohmann/json.hpp>
 #include <thread>
+#include <utility>
 
 #include "Fault_Modes.h"
 #include "Trial_Root.h"
@@ -42,6 +46,7 @@ struct Choice {
   std::size_t every = 1;
   std::string row;
   std::string report;
+  std::size_t jobs = 1;
   std::chrono::seconds patience{60};
 };
 
@@ -273,31 +278,86 @@ Choice parse(int argc, char** argv) {
     const std::string value = argv[i + 1];
     if (name == "--every") choice.every = std::max(1UL, std::stoul(value));
     if (name == "--row") choice.row = value;
+    if (name == "--jobs") choice.jobs = std::max(1UL, std::stoul(value));
     if (name == "--report") choice.report = value;
     if (name == "--seconds") choice.patience = std::chrono::seconds(std::stol(value));
   }
   return choice;
 }
 
-int runMatrix(const Choice& choice) {
-  const host::ClassCatalogue classes(host::allClasses, host::allClassCount);
+// ---- Rows at once ----
+
+Json toJson(const Row& row) {
+  return {{"entryPoint", row.entryPoint}, {"cells", row.cells},        {"requests", row.requests},
+          {"methods", row.methods},       {"calls", row.libraryCalls}, {"leaks", row.leaks},
+          {"crashes", row.crashes},       {"hangs", row.hangs}};
+}
+
+Row rowOf(const Json& json) {
+  return {json["entryPoint"], json["cells"], json["requests"], json["methods"],
+          json["calls"],      json["leaks"], json["crashes"],  json["hangs"]};
+}
+
+Progress& sharedProgress() {
   void* memory =
       mmap(nullptr, sizeof(Progress), PROT_READ | PROT_WRITE, MAP_SHARED | MAP_ANONYMOUS, -1, 0);
   if (memory == MAP_FAILED) throw std::runtime_error("there is no shared memory");
-  Progress& progress = *new (memory) Progress;
-  std::vector<Row> rows;
-  std::size_t position = 0;
-  bool good = true;
-  for (const std::string& name : calledEntryPoints(classes, progress)) {
-    ++position;
-    if (name.find(choice.row) == std::string::npos) continue;
-    rows.push_back(runRowInChildren(choice, classes, name, position, progress));
-    const Row& row = rows.back();
-    good = good && isGood(row);
-    std::cout << name << ": " << row.cells << " cells, " << row.requests << " requests, crashes "
-              << joined(row.crashes) << ", hangs " << joined(row.hangs) << ", leaks " << row.leaks
-              << "\n";
+  return *new (memory) Progress;
+}
+
+/// Runs each N-th row and writes what came of it into the stream, a line for each.
+void runShare(const Choice& choice, const host::ClassCatalogue& classes,
+              const std::vector<std::string>& names, std::size_t share, std::FILE* out) {
+  Progress& progress = sharedProgress();
+  for (std::size_t position = share; position < names.size(); position += choice.jobs) {
+    if (names[position].find(choice.row) == std::string::npos) continue;
+    const Row row = runRowInChildren(choice, classes, names[position], position + 1, progress);
+    std::cout << row.entryPoint << ": " << row.cells << " cells, " << row.requests
+              << " requests, crashes " << joined(row.crashes) << ", hangs " << joined(row.hangs)
+              << ", leaks " << row.leaks << std::endl;
+    std::fprintf(out, "%s\n", toJson(row).dump().c_str());
+    std::fflush(out);
   }
+}
+
+/// The rows of all shares, in the order of their names. A share that ends early is an error.
+std::vector<Row> runShares(const Choice& choice, const host::ClassCatalogue& classes,
+                           const std::vector<std::string>& names) {
+  std::vector<std::FILE*> outs;
+  for (std::size_t share = 0; share < choice.jobs; ++share) {
+    outs.push_back(std::tmpfile());
+    if (outs.back() == nullptr) throw std::runtime_error("there is no temporary file");
+    const pid_t child = fork();
+    if (child < 0) throw std::runtime_error("there is no process");
+    if (child == 0) {
+      runShare(choice, classes, names, share, outs.back());
+      std::_Exit(0);
+    }
+  }
+  bool whole = true;
+  for (int status = 0; wait(&status) > 0;)
+    whole = whole && WIFEXITED(status) && WEXITSTATUS(status) == 0;
+  if (!whole) throw std::runtime_error("a share of the rows was not run to its end");
+  std::vector<Row> rows;
+  for (std::FILE* out : outs) {
+    std::rewind(out);
+    std::string line;
+    for (int c = 0; (c = std::fgetc(out)) != EOF; line += static_cast<char>(c))
+      if (c == '\n') rows.push_back(rowOf(Json::parse(std::exchange(line, ""))));
+    std::fclose(out);
+  }
+  std::sort(rows.begin(), rows.end(),
+            [](const Row& a, const Row& b) { return a.entryPoint < b.entryPoint; });
+  return rows;
+}
+
+int runMatrix(const Choice& choice) {
+  const host::ClassCatalogue classes(host::allClasses, host::allClassCount);
+  const std::vector<std::string> names = calledEntryPoints(classes, sharedProgress());
+  if (std::find(names.begin(), names.end(), "RM_InitLib") == names.end())
+    throw std::runtime_error("no library was found; LD_LIBRARY_PATH has to name their folder");
+  const std::vector<Row> rows = runShares(choice, classes, names);
+  const bool good = std::all_of(rows.begin(), rows.end(), isGood);
   if (!choice.report.empty()) {
     std::ofstream report(choice.report);
     writeReport(report, rows);
