@@ -10,18 +10,21 @@ namespace {
 void fill(HBA_ADAPTERATTRIBUTES& out, const World& world, const Adapter& adapter,
           const Fault_Effect& effect) {
   const Card& card = world.cards[adapter.card];
+  const Port& port = world.ports[adapter.ports.front()];
+  const std::string name = with_running_firmware(world, port, card.node_symbolic_name);
   std::memset(&out, 0, sizeof out);
   write_text(out.Manufacturer, sizeof out.Manufacturer, card.manufacturer, effect);
   write_text(out.SerialNumber, sizeof out.SerialNumber, card.serial_number, effect);
   write_text(out.Model, sizeof out.Model, card.model, effect);
   write_text(out.ModelDescription, sizeof out.ModelDescription, card.model_description, effect);
-  write_text(out.NodeSymbolicName, sizeof out.NodeSymbolicName, card.node_symbolic_name, effect);
+  write_text(out.NodeSymbolicName, sizeof out.NodeSymbolicName, name, effect);
   write_text(out.HardwareVersion, sizeof out.HardwareVersion, card.hardware_version, effect);
   write_text(out.DriverVersion, sizeof out.DriverVersion, card.driver_version, effect);
   write_text(out.OptionROMVersion, sizeof out.OptionROMVersion, card.option_rom_version, effect);
-  write_text(out.FirmwareVersion, sizeof out.FirmwareVersion, card.firmware_version, effect);
+  write_text(out.FirmwareVersion, sizeof out.FirmwareVersion, running_firmware(world, port),
+             effect);
   write_text(out.DriverName, sizeof out.DriverName, card.driver_name, effect);
-  out.NodeWWN = from_wwn(world.ports[adapter.ports.front()].names.node);
+  out.NodeWWN = from_wwn(port.names.node);
   out.VendorSpecificID = card.vendor_specific_id;
   out.NumberOfPorts = effect.returned_size.value_or(static_cast<HBA_UINT32>(adapter.ports.size()));
 }
@@ -30,7 +33,8 @@ void fill_types(HBA_FC4TYPES& out, const Bytes& types) {
   std::memcpy(out.bits, types.data(), std::min(sizeof out.bits, types.size()));
 }
 
-void fill(HBA_PORTATTRIBUTES& out, const Port& port, const Fault_Effect& effect) {
+void fill(HBA_PORTATTRIBUTES& out, const World& world, const Port& port,
+          const Fault_Effect& effect) {
   std::memset(&out, 0, sizeof out);
   out.NodeWWN = from_wwn(port.names.node);
   out.PortWWN = from_wwn(port.names.port);
@@ -40,7 +44,8 @@ void fill(HBA_PORTATTRIBUTES& out, const Port& port, const Fault_Effect& effect)
   out.PortSupportedClassofService = port.class_of_service;
   fill_types(out.PortSupportedFc4Types, port.supported_fc4_types);
   fill_types(out.PortActiveFc4Types, port.active_fc4_types);
-  write_text(out.PortSymbolicName, sizeof out.PortSymbolicName, port.symbolic_name, effect);
+  write_text(out.PortSymbolicName, sizeof out.PortSymbolicName,
+             with_running_firmware(world, port, port.symbolic_name), effect);
   write_text(out.OSDeviceName, sizeof out.OSDeviceName, port.os_device_name, effect);
   out.PortSupportedSpeed = port.supported_speed;
   out.PortSpeed = port.speed;
@@ -141,7 +146,7 @@ HBA_STATUS HBA_GetAdapterPortAttributes(HBA_HANDLE handle, HBA_UINT32 index,
       [=](const World& world, const Adapter& adapter, const Fault_Effect& effect) -> HBA_STATUS {
         if (attributes == nullptr) return HBA_STATUS_ERROR_ARG;
         if (index >= adapter.ports.size()) return HBA_STATUS_ERROR_ILLEGAL_INDEX;
-        fill(*attributes, world.ports[adapter.ports[index]], effect);
+        fill(*attributes, world, world.ports[adapter.ports[index]], effect);
         return HBA_STATUS_OK;
       });
 }

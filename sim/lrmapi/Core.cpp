@@ -23,8 +23,8 @@ RM_STATUS LRM_SetDebugTraces(int, int) {
 
 RM_STATUS LRM_GetHBAAttributes(HBA_WWN wwpn, void* block, uint32_t* size) {
   return port_call("LRM_GetHBAAttributes", wwpn,
-                   [=](World&, const Port& port, const Fault_Effect& effect) {
-                     return answer_block(adapter_attributes(port), block, size, effect);
+                   [=](const World& world, const Port& port, const Fault_Effect& effect) {
+                     return answer_block(adapter_attributes(world, port), block, size, effect);
                    });
 }
 

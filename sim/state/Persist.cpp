@@ -111,6 +111,7 @@ json port_json(const Port& port) {
                  {"oas", oas_json(port)},
                  {"qos", qos_json(port.qos)}};
   object["firmware"] = port.firmware.pending ? json(*port.firmware.pending) : json(nullptr);
+  object["running_firmware"] = port.firmware.running;
   const auto fec = port.values.find(fec_state);
   object["fec"] = fec == port.values.end() ? json(nullptr) : json(fec->second);
   object["dumps"] = {{"directory", port.dumps.directory},
@@ -137,6 +138,7 @@ void restore_values(const json& object, Port& port) {
   if (!object.at("fec").is_null()) {
     port.values.insert_or_assign(fec_state, object.at("fec").get<Bytes>());
   }
+  port.firmware.running = object.value("running_firmware", std::string());
   if (!object.at("firmware").is_null()) {
     port.firmware.pending = object.at("firmware").get<std::string>();
   }

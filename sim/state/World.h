@@ -44,6 +44,7 @@ struct Wwn_Store {
 struct Firmware_Store {
   Activation activation = Activation::Reset;
   std::optional<std::string> pending;  ///< on flash, waiting to become operational
+  std::string running;                 ///< what took the place of the card's; empty: nothing yet
 };
 
 struct Driver_Parameter {
@@ -261,8 +262,13 @@ const Target* find_target(const Port& port, const Wwn& name);
 /// Makes what waits for this activation, or a lesser one, take effect: names and firmware.
 void activate(Port& port, Activation event);
 
+/// The firmware version that the port runs: its card's, or what became operational since.
+const std::string& running_firmware(const World& world, const Port& port);
+/// A text that may tell the firmware version of the port's card, with the version that runs.
+std::string with_running_firmware(const World& world, const Port& port, std::string text);
+
 /// The attributes that LRM_GetHBAAttributes reports through this port.
-Attribute_Map adapter_attributes(const Port& port);
+Attribute_Map adapter_attributes(const World& world, const Port& port);
 /// The attributes that LRM_GetPortAttributes reports.
 Attribute_Map port_attributes(const Port& port);
 /// Seconds on the clock of the counters since the world was made.

@@ -110,6 +110,10 @@ TEST_F(Firmware, GoesFromAFileToTheFlashAndWithAResetIntoOperation) {
   EXPECT_EQ(call("ResetHBA", {{"Target", Value::reference(target)}}), 0u);
   EXPECT_TRUE(soon(
       [&] { return instances("TVXHBA_FCPort").at(0).text("OperationalFirmware") == "2.02a1"; }));
+  EXPECT_EQ(instances("TVXHBA_FCPort").at(0).text("ElementName"),
+            "Torvex TVX16002 firmware 2.02a1 driver 5.2.18.4 PORT-0");
+  EXPECT_EQ(instances("TVXHBA_PortController").at(0).text("ElementName"),
+            "Torvex TVX16002 firmware 2.02a1 driver 5.2.18.4");
 }
 
 TEST_F(Firmware, GoesFromAServerToTheFlashAndLeavesNothingBehind) {

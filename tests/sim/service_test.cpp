@@ -278,6 +278,40 @@ TEST_F(Firmware, AnImageIsVerifiedWrittenAndRunAfterTheReset) {
   EXPECT_EQ(adapter_text(RM_HA_OPERATIONAL_FIRMWARE), "2.02a1");
 }
 
+TEST_F(Firmware, NamesThatTellTheVersionFollowTheFirmwareThatRuns) {
+  ASSERT_EQ(tvxsim_load_text(R"({"cards": [
+      {"model": "TVX16002", "node_symbolic_name": "TVX16002 12.01a4 FV2.01a4 DV2.01a41, 2.01a4",
+       "ports": [{"wwpn": "10000254560C4110"},
+                 {"wwpn": "10000254560C4111", "symbolic_name": "no version"}]},
+      {"model": "TVX16001", "node_symbolic_name": "other 2.01a4",
+       "ports": [{"wwpn": "10000254560C4112"}]}]})"),
+            0)
+      << tvxsim_last_error();
+  const auto told = [this](const char* adapter) {
+    const HBA_HANDLE handle = open(adapter);
+    HBA_ADAPTERATTRIBUTES card{};
+    HBA_PORTATTRIBUTES port{};
+    EXPECT_EQ(SIM_CALL(hba, HBA_GetAdapterAttributes, handle, &card), 0u);
+    EXPECT_EQ(SIM_CALL(hba, HBA_GetAdapterPortAttributes, handle, 0u, &port), 0u);
+    SIM_CALL(hba, HBA_CloseAdapter, handle);
+    return std::vector<std::string>{card.FirmwareVersion, card.NodeSymbolicName,
+                                    port.PortSymbolicName};
+  };
+  using Texts = std::vector<std::string>;
+  const Texts before = {"2.01a4", "TVX16002 12.01a4 FV2.01a4 DV2.01a41, 2.01a4",
+                        "TVX16002 12.01a4 FV2.01a4 DV2.01a41, 2.01a4 PORT-0"};
+  const std::string name = "TVX16002 12.01a4 FV2.02a1 DV2.01a41, 2.02a1";
+  EXPECT_EQ(told("Torvex-TVX16002-1"), before);
+  const std::string path = image("2.02a1", "TVX16", "payload");
+  ASSERT_EQ(SIM_CALL(rm, LRM_DownloadFirmware, first_port, path.c_str(), 0), 0);
+  EXPECT_EQ(told("Torvex-TVX16002-1"), before) << "on flash, but not running";
+  ASSERT_EQ(SIM_CALL(rm, LRM_ResetHBA, first_port, 1), 0);
+  EXPECT_EQ(told("Torvex-TVX16002-1"), (Texts{"2.02a1", name, name + " PORT-0"}));
+  EXPECT_EQ(told("Torvex-TVX16002-2"), (Texts{"2.02a1", name, "no version"}));
+  EXPECT_EQ(adapter_text(RM_HA_NODE_SYMBOLIC_NAME), name);
+  EXPECT_EQ(told("Torvex-TVX16001-3"), (Texts{"2.01a4", "other 2.01a4", "other 2.01a4 PORT-0"}));
+}
+
 TEST_F(Firmware, ARebootMayBeWantedInstead) {
   load_port(R"("firmware": {"activation": "reboot"})");
   const std::string path = image("2.02a1", "", "payload");

@@ -7,6 +7,7 @@
 #include <thread>
 
 #include "sim/Libraries.h"
+#include "support/Firmware_File.h"
 
 namespace tvx::sim_test {
 namespace {
@@ -84,6 +85,23 @@ TEST_F(State, SettingsOfAPortAreFoundAgain) {
   names->count = 4;
   EXPECT_EQ(SIM_CALL(rm, LRM_GetDumpFileNames, first_port, names), 0);
   EXPECT_EQ(names->count, 1u);
+}
+
+TEST_F(State, FirmwareThatRunsIsFoundAgainInTheNamesThatTellItsVersion) {
+  const std::string image = m_Folder / "image.fw";
+  std::ofstream(image, std::ios::binary) << tvx::test::firmwareImage("2.02a1", "TVX16");
+  ASSERT_EQ(SIM_CALL(rm, LRM_DownloadFirmware, first_port, image.c_str(), 0), 0);
+  const auto name = [this] {
+    Block block(rm);
+    EXPECT_EQ(SIM_CALL(rm, LRM_GetHBAAttributes, first_port, block.data(), &block.size), 0);
+    return block.text(RM_HA_NODE_SYMBOLIC_NAME);
+  };
+  EXPECT_NE(name().find("2.01a4"), std::string::npos) << name();
+  boot();
+  EXPECT_NE(name().find("2.02a1"), std::string::npos) << name();
+  ASSERT_EQ(SIM_CALL(rm, LRM_DiagBeacon, first_port, 3u), 0);  // writes the file anew
+  boot();
+  EXPECT_NE(name().find("2.02a1"), std::string::npos) << name();
 }
 
 TEST_F(State, TheFileIsForItsOwnerAlone) {
