@@ -124,6 +124,7 @@ HBA_STATUS FCPort::getFcpTargetMapping(HBA_HANDLE handle, TVX_Block& mapping, st
   for (int tries = 0; tries < MAPPING_TRIES; ++tries) {
     TVX_LOG(TVX_DBG, "To retry the HBA_GetFcpTargetMapping command");
     TVX_LOG(TVX_DBG, "Deleting the allocated memory");
+    mapping.reset();  // before the next one is asked for: both can be large
     mapping = allocateMapping(rows);
     if (mapping == nullptr) {
       TVX_LOG(TVX_CRIT, "Could not allocate memory..break ");

@@ -99,13 +99,16 @@ Target::Target(Adapter* adapter, Port*, const HBA_FCPSCSIENTRY& row) {
   scsiOSLun = row.ScsiId.ScsiOSLun;
   logValue("Node WWN", nodeWWN.c_str());
   logValue("Port WWN", portWWN.c_str());
-  const Snia_Adapter snia(adapter->getName());
-  const HBA_WWN& wwpn = row.FcpId.PortWWN;
+  askUnit(adapter->getName(), row.FcpId.PortWWN);
+  TVX_LOG(TVX_DBG, "End Creating Target...");
+}
+
+void Target::askUnit(const std::string& adapterName, const HBA_WWN& wwpn) {
+  const Snia_Adapter snia(adapterName);
   inquireStandard(snia.handle(), wwpn);
   inquireSerialNumber(snia.handle(), wwpn);
   inquireIdentification(snia.handle(), wwpn);
   readCapacity(snia.handle(), wwpn);
-  TVX_LOG(TVX_DBG, "End Creating Target...");
 }
 
 void Target::inquireStandard(HBA_HANDLE handle, const HBA_WWN& wwpn) {

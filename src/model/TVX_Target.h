@@ -62,6 +62,8 @@ class Target {
   Target() = default;  ///< asks nothing
 
  private:
+  /// All commands, over a handle that is closed again when they are done.
+  void askUnit(const std::string& adapterName, const HBA_WWN& wwpn);
   void inquireStandard(HBA_HANDLE handle, const HBA_WWN& wwpn);
   void inquireSerialNumber(HBA_HANDLE handle, const HBA_WWN& wwpn);
   void inquireIdentification(HBA_HANDLE handle, const HBA_WWN& wwpn);

@@ -2,6 +2,7 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <array>
 #include <cstring>
 #include <map>
@@ -20,12 +21,23 @@ namespace {
 using testing::ElementsAre;
 using tvx::test::Fake_Host;
 using tvx::test::Log_Capture;
+using tvx::test::Logged;
 using tvx::test::wwnOf;
 
 constexpr const char* FAILURE = "HBA_SendScsiInquiry_t(0x80) returns ";
 
 /// The commands of a unit, by page; READ CAPACITY apart.
 enum Command_Kind { STANDARD = 0, SERIAL = 0x80, IDENTIFICATION = 0x83, CAPACITY = 0x100 };
+
+/// Where a command went: the handle, the last byte of the target's name, and the unit.
+struct Address {
+  HBA_HANDLE handle;
+  int target;
+  HBA_UINT64 lun;
+  bool operator==(const Address&) const = default;
+};
+
+std::vector<std::size_t> allocated;  // sizes of the buffers that were asked for
 
 class Targets : public testing::Test {
  protected:
@@ -35,17 +47,22 @@ class Targets : public testing::Test {
                            [this](HBA_HANDLE, HBA_FCPTARGETMAPPING* out) { return map(out); });
     host.libraries.provide(
         HBA_SendScsiInquiry,
-        [this](HBA_HANDLE, HBA_WWN, HBA_UINT64, HBA_UINT8 evpd, HBA_UINT32 page, void* response,
-               HBA_UINT32 responseSize, void* sense, HBA_UINT32 senseSize) {
+        [this](HBA_HANDLE handle, HBA_WWN target, HBA_UINT64 lun, HBA_UINT8 evpd, HBA_UINT32 page,
+               void* response, HBA_UINT32 responseSize, void* sense, HBA_UINT32 senseSize) {
           EXPECT_EQ(responseSize, 255U);
           EXPECT_EQ(senseSize, 128U);
           EXPECT_EQ(evpd, page != 0 ? 1 : 0);
+          addresses.push_back({handle, target.wwn[7], lun});
           return command(static_cast<Command_Kind>(page), response, sense);
         });
-    host.libraries.provide(
-        HBA_SendReadCapacity,
-        [this](HBA_HANDLE, HBA_WWN, HBA_UINT64, void* response, HBA_UINT32, void* sense,
-               HBA_UINT32) { return command(CAPACITY, response, sense); });
+    host.libraries.provide(HBA_SendReadCapacity,
+                           [this](HBA_HANDLE handle, HBA_WWN target, HBA_UINT64 lun, void* response,
+                                  HBA_UINT32 responseSize, void* sense, HBA_UINT32 senseSize) {
+                             EXPECT_EQ(responseSize, 255U);
+                             EXPECT_EQ(senseSize, 128U);
+                             addresses.push_back({handle, target.wwn[7], lun});
+                             return command(CAPACITY, response, sense);
+                           });
     data.buildAdapterData();
     capture.forget();
   }
@@ -69,11 +86,25 @@ class Targets : public testing::Test {
   }
 
   HBA_STATUS command(Command_Kind kind, void* response, void* sense) {
+    if (sent.empty() || sent.back() != kind) {
+      EXPECT_TRUE(isZero(response, 255) && isZero(sense, 128)) << "at the first try of " << kind;
+    }
     sent.push_back(kind);
+    std::vector<HBA_STATUS>& before = firstStatuses[kind];
+    if (!before.empty()) {
+      const HBA_STATUS status = before.front();
+      before.erase(before.begin());
+      return status;
+    }
     auto& [status, text] = answers[kind];
     std::memcpy(response, text.data(), std::min<std::size_t>(text.size(), 255));
     std::memset(sense, 0x5A, 24);
     return status;
+  }
+
+  static bool isZero(const void* place, std::size_t size) {
+    const auto* bytes = static_cast<const std::uint8_t*>(place);
+    return std::all_of(bytes, bytes + size, [](std::uint8_t byte) { return byte == 0; });
   }
 
   HBA_FCPSCSIENTRY& addRow(std::uint8_t number) {
@@ -100,7 +131,9 @@ class Targets : public testing::Test {
   HBA_UINT32 claimed = 0;            // count left in the buffer, if not 0
   std::vector<HBA_UINT32> asked;     // room of each mapping call
   std::map<Command_Kind, std::pair<HBA_STATUS, std::string>> answers;
+  std::map<Command_Kind, std::vector<HBA_STATUS>> firstStatuses;  // before those answers
   std::vector<int> sent;
+  std::vector<Address> addresses;  // to which they were sent
 };
 
 // ---- The mapping ----
@@ -128,7 +161,7 @@ TEST_F(Targets, ARescanReplacesTheOldOnes) {
   rows.clear();
   addRow(2);
   data.buildSANData();
-  EXPECT_TRUE(capture.has(TVX_DBG, "Freeing Target: 5000000000000001"));
+  EXPECT_EQ(capture.count(TVX_DBG, "Freeing Target: 5000000000000001"), 1U);
   ASSERT_EQ(port().getNumberOfTargets(), 1U);
   EXPECT_EQ(port().getTarget(0)->portWWN, "5000000000000002");
 }
@@ -144,7 +177,10 @@ TEST_F(Targets, AVanishedAdapterLeavesThePortEmpty) {
   addRow(1);
   data.buildSANData();
   host.adapters[0].opens = false;
+  capture.forget();
   data.buildSANData();
+  EXPECT_LT(capture.position("Freeing Target: 5000000000000001"),
+            capture.position("HBA_OpenAdapter failed, skipping Adapter Torvex-A0"));
   EXPECT_EQ(port().getNumberOfTargets(), 0U);
   EXPECT_TRUE(capture.has(TVX_ERR, "HBA_OpenAdapter failed, skipping Adapter Torvex-A0"));
   EXPECT_TRUE(capture.has(TVX_ERR, "Issue with Target Rescan - moving to the next Port"));
@@ -177,10 +213,82 @@ TEST_F(Targets, ThreeTriesAreAll) {
     statuses.assign(3, status);
     data.buildSANData();
     EXPECT_EQ(asked.size(), 3U);
+    EXPECT_EQ(host.refreshed, status == 8 ? 3 : 0);
     EXPECT_EQ(port().getNumberOfTargets(), 0U);
     EXPECT_TRUE(capture.has(TVX_DBG, "Successful target info fetched"));
     EXPECT_FALSE(capture.has(TVX_DBG, "All Ok ...break "));
   }
+}
+
+TEST_F(Targets, AMappingThatGrowsOnIsAskedWithMoreRoomEachTime) {
+  HBA_UINT32 grown = 300;
+  host.libraries.provide(HBA_GetFcpTargetMapping, [&](HBA_HANDLE, HBA_FCPTARGETMAPPING* out) {
+    asked.push_back(out->NumberOfEntries);
+    out->NumberOfEntries = grown;
+    grown += 300;
+    return HBA_STATUS{HBA_STATUS_ERROR_MORE_DATA};
+  });
+  data.buildSANData();
+  EXPECT_THAT(asked, ElementsAre(256U, 300U, 600U));
+  for (const char* room : {"300", "600", "900"})
+    EXPECT_EQ(capture.count(TVX_DBG, std::string("Increasing the buffer to = ") + room), 1U);
+  EXPECT_TRUE(capture.has(TVX_DBG, "Successful target info fetched"));
+  EXPECT_TRUE(capture.allAt(TVX_DBG)) << "the exhausted tries have no line of their own";
+  EXPECT_EQ(port().getNumberOfTargets(), 0U);
+}
+
+TEST_F(Targets, AnEmptyMappingIsToldOfWhateverTheStatus) {
+  host.libraries.provide(HBA_GetFcpTargetMapping, [&](HBA_HANDLE, HBA_FCPTARGETMAPPING* out) {
+    asked.push_back(out->NumberOfEntries);
+    out->NumberOfEntries = 0;
+    return HBA_STATUS{HBA_STATUS_ERROR_MORE_DATA};
+  });
+  data.buildSANData();
+  EXPECT_THAT(asked, ElementsAre(256U, 0U, 0U)) << "the room that it says it needs";
+  EXPECT_EQ(capture.count(TVX_DBG, "HBA_GetFcpTargetMapping_t() found no target mappings"), 1U);
+  EXPECT_EQ(port().getNumberOfTargets(), 0U);
+}
+
+TEST_F(Targets, TheBufferHoldsTheToldRowsBehindItsHeader) {
+  for (int i = 0; i < 300; ++i) addRow(static_cast<std::uint8_t>(i));
+  allocated.clear();
+  tvxSetAllocator([](std::size_t size) -> void* {
+    allocated.push_back(size);
+    return std::calloc(1, size);
+  });
+  data.buildSANData();
+  EXPECT_THAT(allocated, ElementsAre(8U + 256 * 304, 8U + 300 * 304));
+  EXPECT_EQ(port().getTarget(299)->portWWN, "500000000000002B");
+}
+
+TEST_F(Targets, WithoutMemoryForMoreRowsThereAreNone) {
+  for (int i = 0; i < 300; ++i) addRow(static_cast<std::uint8_t>(i));
+  allocated.clear();
+  tvxSetAllocator([](std::size_t size) -> void* {
+    allocated.push_back(size);
+    return allocated.size() == 1 ? std::calloc(1, size) : nullptr;
+  });
+  data.buildSANData();
+  EXPECT_THAT(asked, ElementsAre(256U));
+  EXPECT_EQ(capture.count(TVX_CRIT, "Could not allocate memory..break "), 1U);
+  EXPECT_FALSE(capture.has(TVX_DBG, "Successful target info fetched"));
+  EXPECT_EQ(port().getNumberOfTargets(), 0U);
+}
+
+TEST_F(Targets, TheCountIsReadAfreshForEachRow) {
+  for (std::uint8_t i = 1; i <= 5; ++i) addRow(i);
+  HBA_FCPTARGETMAPPING* kept = nullptr;
+  host.libraries.provide(HBA_GetFcpTargetMapping, [&](HBA_HANDLE, HBA_FCPTARGETMAPPING* out) {
+    kept = out;
+    return map(out);
+  });
+  host.libraries.provide(HBA_SendReadCapacity, [&](HBA_HANDLE, HBA_WWN target, HBA_UINT64, void*,
+                                                   HBA_UINT32, void*, HBA_UINT32) {
+    if (target.wwn[7] == 2) kept->NumberOfEntries = 3;
+    return HBA_STATUS{0};
+  });
+  data.buildSANData();
+  EXPECT_EQ(port().getNumberOfTargets(), 3U);
 }
 
 TEST_F(Targets, AnotherFailureEndsTheScan) {
@@ -206,6 +314,7 @@ TEST_F(Targets, CountsThatNoSanHasAreNotAllocated) {
   claimed = 0xFFFFFFFF;
   data.buildSANData();
   EXPECT_EQ(asked.size(), 1U);
+  EXPECT_TRUE(capture.has(TVX_DBG, "Increasing the buffer to = -1"));
   EXPECT_TRUE(capture.has(TVX_CRIT, "Could not allocate memory..break "));
 }
 
@@ -278,6 +387,34 @@ TEST_F(Targets, ThePortAfterOneThatVanishedIsScanned) {
 
 // ---- One unit ----
 
+TEST_F(Targets, AUnitIsAskedOverAHandleOfItsOwn) {
+  addRow(1).FcpId.FcpLun = 0x0700;
+  addRow(2);
+  HBA_HANDLE next = 20;
+  std::vector<std::string> calls;
+  host.libraries.provide(HBA_OpenAdapter, [&](char* name) {
+    EXPECT_STREQ(name, "Torvex-A0");
+    calls.push_back("open " + std::to_string(++next));
+    return next;
+  });
+  // The handle is closed before the unit is told to be done.
+  host.libraries.provide(HBA_CloseAdapter, [&](HBA_HANDLE handle) {
+    const std::size_t done = capture.count(TVX_DBG, "End Creating Target...");
+    calls.push_back("close " + std::to_string(handle) + ", done " + std::to_string(done));
+  });
+  host.libraries.provide(HBA_GetFcpTargetMapping,
+                         [&](HBA_HANDLE handle, HBA_FCPTARGETMAPPING* out) {
+                           EXPECT_EQ(handle, 21U);
+                           return map(out);
+                         });
+  data.buildSANData();
+  EXPECT_THAT(calls, ElementsAre("open 21", "open 22", "close 22, done 0", "open 23",
+                                 "close 23, done 1", "close 21, done 2"));
+  const Address first{22, 1, 0x0700};
+  const Address second{23, 2, 0};
+  EXPECT_THAT(addresses, ElementsAre(first, first, first, first, second, second, second, second));
+}
+
 TEST_F(Targets, TakesTheRow) {
   HBA_FCPSCSIENTRY& row = addRow(0x1F);
   row.FcpId.FcId = 0x010203;
@@ -296,6 +433,16 @@ TEST_F(Targets, TakesTheRow) {
   EXPECT_EQ(target.scsiBusNumber, 1U);
   EXPECT_EQ(target.scsiTargetNumber, 2U);
   EXPECT_EQ(target.scsiOSLun, 3U);
+  const std::size_t begin = capture.position("Creating Target...");
+  EXPECT_EQ(capture.lines().at(begin + 1), (Logged{TVX_DBG, "Node WWN: 510000000000001F"}));
+  EXPECT_EQ(capture.lines().at(begin + 2), (Logged{TVX_DBG, "Port WWN: 500000000000001F"}));
+}
+
+TEST_F(Targets, TheNameOfTheSystemMayFillItsField) {
+  char(&field)[256] = addRow(1).ScsiId.OSDeviceName;
+  std::fill(std::begin(field), std::end(field), 'n');
+  data.buildSANData();
+  EXPECT_EQ(port().getTarget(0)->osDeviceName, std::string(256, 'n'));
 }
 
 TEST_F(Targets, SendsFourCommandsInOrder) {
@@ -398,12 +545,65 @@ TEST_F(Targets, CheckConditionsAreTriedThreeTimesEach) {
   for (const std::string& text : capture.texts()) EXPECT_FALSE(text.starts_with("Sense Data"));
 }
 
+TEST_F(Targets, EveryCommandIsTriedThreeTimes) {
+  const Command_Kind kinds[] = {STANDARD, SERIAL, IDENTIFICATION, CAPACITY};
+  for (const Command_Kind kind : kinds) {
+    answers.clear();
+    answers[kind].first = 9;
+    rows.clear();
+    sent.clear();
+    capture.forget();
+    scanOne();
+    for (const Command_Kind other : kinds)
+      EXPECT_EQ(std::count(sent.begin(), sent.end(), other), other == kind ? 3 : 1) << kind;
+    EXPECT_EQ(sent.back(), CAPACITY) << "the next command is still sent";
+    EXPECT_EQ(failures(9), 1U) << kind;
+  }
+}
+
+TEST_F(Targets, AUnitThatRecoversIsTakenAsItAnswers) {
+  std::string page(36, ' ');
+  page[0] = '\x05';
+  page.replace(8, 6, "VENDOR");
+  answers[STANDARD].second = page;
+  answers[SERIAL].second = std::string("\0\x80\0\x04SER1", 8);
+  answers[IDENTIFICATION].second = std::string("\0\x83\0\x09\x01\x02\0\x01I", 9);
+  answers[CAPACITY].second = std::string("\0\0\0\x07\0\0\x02\0", 8);
+  for (const Command_Kind kind : {STANDARD, SERIAL, IDENTIFICATION, CAPACITY})
+    firstStatuses[kind] = {9, 9};
+  const Target& target = scanOne();
+  EXPECT_EQ(sent.size(), 12U);
+  EXPECT_EQ(target.deviceType, 5U);
+  EXPECT_EQ(target.vendor, "VENDOR  ");
+  EXPECT_EQ(target.serialNumber, "SER1");
+  EXPECT_EQ(target.deviceIdentification.identifierType, 2U);
+  EXPECT_EQ(target.blockCount, 7U);
+  EXPECT_EQ(failures(9), 0U);
+}
+
+TEST_F(Targets, AnotherStatusEndsTheTries) {
+  for (const Command_Kind kind : {STANDARD, SERIAL, IDENTIFICATION, CAPACITY}) {
+    firstStatuses[kind] = {9};
+    answers[kind].first = 12;
+  }
+  scanOne();
+  EXPECT_EQ(sent.size(), 8U);
+  EXPECT_EQ(failures(12), 4U);
+  for (const std::string& text : capture.texts()) EXPECT_FALSE(text.starts_with("Sense Data"));
+}
+
 TEST_F(Targets, AFailedIdentificationLogsTheSenseData) {
   answers[IDENTIFICATION] = {9, std::string(255, '\xFF')};
-  EXPECT_EQ(scanOne().deviceIdentification.pageCode, 0);
+  const DeviceIdentification& id = scanOne().deviceIdentification;
+  EXPECT_EQ(id.peripheralType, 0);
+  EXPECT_EQ(id.pageCode, 0);
+  EXPECT_EQ(id.pageLength, 0U);
+  EXPECT_EQ(id.identifierType, 0U);
+  EXPECT_EQ(id.identifierLength, 0U);
+  EXPECT_TRUE(isZero(id.identifier.data(), id.identifier.size()));
   std::string sense = "Sense Data: ";
   for (int i = 0; i < 24; ++i) sense += "5a ";
-  EXPECT_TRUE(capture.has(TVX_DBG, sense));
+  EXPECT_EQ(capture.count(TVX_DBG, sense), 1U);
   EXPECT_EQ(failures(9), 1U);
 }
 
