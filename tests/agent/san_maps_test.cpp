@@ -57,6 +57,23 @@ TEST_F(San_Maps, TargetEndpoint) {
   EXPECT_EQ(texts(endpoint.IdentifyingDescriptions), Texts{"OS Device Name"});
 }
 
+TEST_F(San_Maps, EndpointTellsWhatTheSystemCountsAndTheWholeIdentifierOfThePort) {
+  ProviderAgent& agent = buildUnits(R"({"first": 7})");
+  Target& target = *agent.m_pData->m_Ports.at(0)->getTarget(0);
+  target.fcId = 0xFFFFFFFF;
+  target.scsiBusNumber = 5;
+  target.scsiTargetNumber = 6;
+  target.scsiOSLun = 0xFFFFFFFF;
+  EXPECT_EQ(rebuildSAN(agent), 0);
+  const TVXHBA_SCSIProtocolEndpoint& endpoint = *agent.m_TVXHBA_SCSIProtocolEndpoint_map[0];
+  EXPECT_EQ(endpoint.FCID.value, std::uint64_t{0xFFFFFFFF});
+  EXPECT_EQ(endpoint.SCSIBusNumber.value, 5u);
+  EXPECT_EQ(endpoint.SCSITargetNumber.value, 6u);
+  // The number of the device is the system's, not the unit's, and is written signed.
+  EXPECT_EQ(text(endpoint.Name), endpointName(7));
+  EXPECT_EQ(text(agent.m_TVXHBA_StorageVolume_map[0]->ElementName), "Storage Volume: -1");
+}
+
 TEST_F(San_Maps, EachUnitHasAnEndpointInTheSystem) {
   ProviderAgent& agent = buildUnits(R"({"count": 3})");
   ASSERT_EQ(agent.m_TVXHBA_SCSIProtocolEndpoint_map.size(), 3u);
@@ -265,14 +282,49 @@ TEST_F(San_Maps, ArbitraryLogicalUnit) {
             (Texts{"OS Device Name", "Standard SCSI inquiry data"}));
 }
 
-TEST_F(San_Maps, PathsCarryNoValuesOfTheirOwn) {
-  ProviderAgent& agent = buildUnits(R"({"count": 1})");
-  const auto& path = *agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map[0];
+template <class Path>
+void expectNoValues(const Instance_Map<Path>& paths) {
+  ASSERT_EQ(paths.size(), 1u) << Path::static_meta_class.name;
+  const Path& path = *paths[0];
   EXPECT_TRUE(path.State.is_null());
   EXPECT_TRUE(path.OSDeviceName.is_null());
   EXPECT_TRUE(path.AdministrativeWeight.is_null());
   EXPECT_TRUE(path.AdministrativeOverride.is_null());
   EXPECT_TRUE(path.LogicalUnitNumber.is_null());
+}
+
+TEST_F(San_Maps, PathsCarryNoValuesOfTheirOwn) {
+  ProviderAgent& agent = buildUnits(UNIT_OF_EACH_CLASS);
+  expectNoValues(agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map);
+  expectNoValues(agent.m_TVXHBA_SCSIInitiatorTargetTapeDrivePath_map);
+  expectNoValues(agent.m_TVXHBA_SCSIInitiatorTargetStorageExtentPath_map);
+  expectNoValues(agent.m_TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath_map);
+  expectNoValues(agent.m_TVXHBA_SCSIInitiatorTargetLogicalDiskPath_map);
+}
+
+TEST_F(San_Maps, OtherIdentifiersNameEveryClassThatIsNamedByThem) {
+  for (const char* type : {"1", "2", "8"}) {
+    ProviderAgent& agent = buildUnits(
+        R"([{"first": 0, "type": 0, "identifier": {"hex": "5001020304050607", "type": )" +
+        std::string(type) +
+        R"(}}, {"first": 1, "type": 7, "identifier": {"hex": "5001020304050607", "type": )" + type +
+        R"(}}, {"first": 2, "type": 17, "identifier": {"hex": "5001020304050607", "type": )" +
+        type + "}}]");
+    EXPECT_EQ(text(agent.m_TVXHBA_StorageVolume_map[0]->Name), "5001020304050607") << type;
+    EXPECT_EQ(text(agent.m_TVXHBA_StorageExtent_map[0]->Name), "5001020304050607") << type;
+    EXPECT_EQ(text(agent.m_TVXHBA_LogicalDisk_map[0]->Name), "5001020304050607") << type;
+  }
+}
+
+TEST_F(San_Maps, ExtentsAndDisksWithoutBlocksHaveNoCapacityEither) {
+  ProviderAgent& agent = buildUnits(R"([{"first": 0, "type": 5, "blocks": 0},
+    {"first": 1, "type": 17, "blocks": 0}])");
+  const TVXHBA_StorageExtent& extent = *agent.m_TVXHBA_StorageExtent_map[0];
+  const TVXHBA_LogicalDisk& disk = *agent.m_TVXHBA_LogicalDisk_map[0];
+  EXPECT_TRUE(extent.Capacity.is_null() && extent.CapacityUnit.is_null());
+  EXPECT_TRUE(extent.BlockSize.is_null() && extent.NumberOfBlocks.is_null());
+  EXPECT_TRUE(disk.Capacity.is_null() && disk.CapacityUnit.is_null());
+  EXPECT_TRUE(disk.BlockSize.is_null() && disk.NumberOfBlocks.is_null());
 }
 
 TEST_F(San_Maps, DevicesAreAnnouncedWithTheirAssociations) {
@@ -360,6 +412,11 @@ TEST_F(San_Maps, TapeWithoutMediumHasNoCapacity) {
   EXPECT_TRUE(drive.CapacityUnit.is_null());
   EXPECT_EQ(text(drive.Name), "/dev/st0");
   EXPECT_EQ(text(drive.ElementName), "Tape Drive 0");
+  EXPECT_EQ(text(drive.Description).substr(0, 8), "ACMESTOR");
+  EXPECT_EQ(text(drive.DeviceID).substr(0, 34), std::string(SAN_PORT) + "_" + SAN_TARGET + "_");
+  EXPECT_EQ(drive.DeviceType.value, 1);
+  EXPECT_EQ(texts(drive.OtherIdentifyingInfo)[0], "/dev/st0");
+  EXPECT_EQ(numbers(drive.OperationalStatus), Numbers{0});
 }
 
 TEST_F(San_Maps, CapacityNeedsBothNumbers) {
@@ -413,11 +470,6 @@ TEST_F(San_Maps, NameOfAnOddIdentifierCanComeFromItsFormat) {
   EXPECT_EQ(text(volume.DeviceID), "10000254560C3001_500C0FF12A001001__0000000000000000");
 }
 
-TEST_F(San_Maps, NumberOfTheSystemIsWrittenSigned) {
-  ProviderAgent& agent = buildUnits(R"({"first": 16777215})");
-  EXPECT_EQ(text(agent.m_TVXHBA_StorageVolume_map[0]->ElementName), "Storage Volume: 16777215");
-}
-
 // --- The walk ------------------------------------------------------------------------------------
 
 TEST_F(San_Maps, HostWithoutTargetsHasEmptyMaps) {
@@ -445,6 +497,23 @@ TEST_F(San_Maps, WalkTellsItsProgress) {
                        "PERF: updateSANMaps: cleanExit"};
   EXPECT_EQ(log.only(lines), lines);
   for (const std::string& line : lines) EXPECT_EQ(log.level(line), TVX_DBG) << line;
+}
+
+TEST_F(San_Maps, UnitIsBuiltFromTheEndpointToThePath) {
+  ProviderAgent& agent = buildUnits(R"({"first": 3, "identifier": {"length": 20}})");
+  EXPECT_TRUE(agent.m_TVXHBA_StorageVolume_map[0]->Caption.is_null());
+  log.clear();
+  EXPECT_EQ(rebuildSAN(agent), 0);
+  const Texts lines = {"Creating classes for target 0 of 1.",
+                       "Generating TVXHBA_LocalHostedAccessPoint (Local Hosted Access Point " +
+                           endpointName(3) + ")",
+                       "Target 0 is of type 0.",
+                       "Storage Volume: ",  // the class has no caption
+                       "Generating TVXHBA_StorageVolumeSystemDevice (" + std::string(SAN_PORT) +
+                           "_" + SAN_TARGET + "__" + smallLun(3) + ")",
+                       "creating TVXHBA_SCSIInitiatorTargetStorageVolumePath - Storage Volume",
+                       "Set content: 10000254560C3001|500C0FF12A001001"};
+  EXPECT_EQ(log.only(lines), lines);
 }
 
 TEST_F(San_Maps, RebuildReplacesTheOldInstances) {
@@ -505,23 +574,17 @@ TEST_F(San_Maps, ReadersOfAssociationsHaveTheirEndsForThemselves) {
 }
 
 TEST_F(San_Maps, MapsOfManyUnitsAreEmptiedWhole) {
-  ProviderAgent& agent = buildUnits(R"([{"count": 700}, {"first": 700, "type": "tape"}])");
-  EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 700u);
-  EXPECT_EQ(agent.m_TVXHBA_TapeDrive_map.size(), 1u);
+  ProviderAgent& agent = buildUnits(
+      R"([{"count": 700}, {"first": 700, "type": "tape"}, {"first": 701, "type": 2, "count": 300},
+          {"first": 1001, "type": 12}, {"first": 1002, "type": 17}])");
+  EXPECT_EQ(sizesOf(agent), (std::vector<std::size_t>{1003, 1003, 700, 700, 700, 1, 1, 1, 300, 300,
+                                                      300, 1, 1, 1, 1, 1, 1}));
   log.clear();
   agent.clearSANMaps();
   EXPECT_EQ(log.count("Exiting clearSANMaps()"), 1u);
-  for (const Instance_Map_Base* map :
-       {static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_SCSIProtocolEndpoint_map),
-        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_LocalHostedAccessPoint_map),
-        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_StorageVolume_map),
-        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_StorageVolumeSystemDevice_map),
-        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map),
-        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_TapeDrive_map),
-        static_cast<Instance_Map_Base*>(&agent.m_TVXHBA_SCSIInitiatorTargetTapeDrivePath_map)})
-    EXPECT_EQ(map->size(), 0u) << map->meta_class()->name;
+  EXPECT_EQ(sizesOf(agent), std::vector<std::size_t>(17, 0));
   EXPECT_EQ(agent.updateSANMaps(), 0);
-  EXPECT_EQ(agent.m_TVXHBA_SCSIProtocolEndpoint_map.size(), 701u);
+  EXPECT_EQ(agent.m_TVXHBA_SCSIProtocolEndpoint_map.size(), 1003u);
 }
 
 TEST_F(San_Maps, OneRemotePortBehindTwoPortsIsTwo) {

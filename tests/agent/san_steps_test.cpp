@@ -12,9 +12,6 @@ constexpr const char* NO_INITIATOR =
 constexpr const char* ERROR = "Error updating SAN maps";
 constexpr const char* CLEAN_EXIT = "PERF: updateSANMaps: cleanExit";
 
-constexpr const char* UNIT_OF_EACH_CLASS = R"([{"first": 0, "type": 0}, {"first": 1, "type": 1},
-  {"first": 2, "type": 2}, {"first": 3, "type": 12}, {"first": 4, "type": 17}])";
-
 class San_Steps : public San_Maps {
  protected:
   /// Runs steps of the unit at `index` again, which then meet their own entries in the maps.
@@ -49,9 +46,30 @@ TEST_F(San_Steps, PortWithoutInitiatorEndpointEndsTheBuildWithWhatThereIs) {
   EXPECT_EQ(log.count(CLEAN_EXIT), 0u);
   EXPECT_EQ(log.count("Set content: 1000000000000001|5000000000000001"), 0u);
   EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 2u);
+  Delivered delivered;
+  agent.enumSANInstances(agent.m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map,
+                         delivered.handler());
+  EXPECT_EQ(delivered.size(), 2u) << "what stands for the ports before it is served";
   agent.m_TVXHBA_SCSIProtocolInitiatorEndpoint_map.clear();
-  EXPECT_EQ(rebuildSAN(agent), MAP_BUILD_FAILED);
+  EXPECT_EQ(rebuildSAN(agent), 0x8001);
+  EXPECT_EQ(log.count(NO_INITIATOR), 2u);
   EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 0u);
+}
+
+TEST_F(San_Steps, RefreshServesTheUnitsOfThePortsBeforeOneThatTheAdapterMapsLack) {
+  // Two ports on one adapter cannot both be in the adapter maps: those end before the second. What
+  // lies behind the adapter is told of either.
+  ProviderAgent& agent = buildHost(R"({"cards": [{"serial_number": "A", "adapter_per": "card",
+    "ports": [
+      {"wwpn": "1000000000000001", "targets": [{"wwpn": "5000000000000001", "luns": {"count": 2}}]},
+      {"wwpn": "1000000000000002"}]}]})");
+  EXPECT_EQ(agent.m_pData->m_Ports.at(1)->getNumberOfTargets(), 2u);
+  EXPECT_EQ(log.level(NO_INITIATOR), TVX_ERR);
+  EXPECT_EQ(log.count(CLEAN_EXIT), 0u);
+  EXPECT_TRUE(agent.m_bIsSANMapsReady);
+  Delivered delivered;
+  agent.enumSANInstances(agent.m_TVXHBA_SCSIProtocolEndpoint_map, delivered.handler());
+  EXPECT_EQ(delivered.size(), 2u);
 }
 
 TEST_F(San_Steps, PartialMapsAreServedAndTheNextRefreshRepairsThem) {
@@ -64,6 +82,10 @@ TEST_F(San_Steps, PartialMapsAreServedAndTheNextRefreshRepairsThem) {
   Delivered delivered;
   agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, delivered.handler());
   EXPECT_EQ(delivered.size(), 3u);  // up to the unit that stands in the mapping twice
+  EXPECT_EQ(log.count("Set content: 10000254560C3001|500C0FF12A001001"), 0u);
+  EXPECT_EQ(rebuildSAN(agent), 0x8001);
+  const std::vector<std::size_t> sizes = sizesOf(agent);
+  EXPECT_EQ(std::vector(sizes.begin(), sizes.begin() + 5), std::vector<std::size_t>(5, 3));
   useScenario(unitsBehindOnePort(R"({"count": 4})"));
   refresh(agent);
   EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 4u);
@@ -198,6 +220,22 @@ TEST_F(San_Steps, RemotePortMayHaveNoChip) {
   EXPECT_EQ(findPortTarget(agent, ENTRY).chip, nullptr);
   agent.m_TVXHBA_Chip_map[0]->Tag.set("");
   EXPECT_EQ(findPortTarget(agent, ENTRY).chip, nullptr) << "a port that names no chip has none";
+}
+
+TEST_F(San_Steps, LastPortOfAChipDecidesWhatTheChipTells) {
+  const auto chipBehind = [this](const char* first, const char* second) {
+    ProviderAgent& agent = buildHost(
+        R"({"cards": [{"serial_number": "A", "ports": [
+          {"wwpn": "1000000000000001", "oas_supported": )" +
+        std::string(first) +
+        R"(, "targets": [{"wwpn": "5000000000000001", "luns": {"count": 1}}]},
+          {"wwpn": "1000000000000002", "oas_supported": )" +
+        second + R"(, "targets": [{"wwpn": "5000000000000001", "luns": {"count": 1}}]}]}]})");
+    EXPECT_EQ(agent.m_TVXHBA_Chip_map.size(), 1u);
+    return agent.m_TVXHBA_Chip_map[0]->OASCapability.value;
+  };
+  EXPECT_EQ(chipBehind("false", "true"), 1);
+  EXPECT_EQ(chipBehind("true", "false"), 0);
 }
 
 TEST_F(San_Steps, EntryWithoutATargetIsTakenAsItIs) {
