@@ -146,6 +146,16 @@ TEST(LunsTest, MarksFollowTheState) {
   EXPECT_EQ(cardMark({"m", "s", {}}), '?');
 }
 
+TEST(LunsTest, TheTreeMarksWhatDoesNotAnswer) {
+  const auto rows = lunRows(
+      {endpoint(LUN5, "Unknown Unknown Revision Unkn Serial Number Unknown", "Unknown")}, {});
+  const std::string text = treeText("host-1", {{"TVX-1", "SN9", {portInState("OK")}}}, rows);
+  EXPECT_NE(text.find("\n      ! target 50:0C:0F:F1:2A:00:10:01  0x010203\n"
+                      "        ! LUN 5  no answer  /dev/sda\n"),
+            std::string::npos)
+      << text;
+}
+
 TEST(LunsTest, TheTreeIsIndented) {
   const auto rows = lunRows({endpoint(LUN5), endpoint(LUN6)}, {device("", LUN5, 0)});
   EXPECT_EQ(treeText("host-1", {{"TVX-1", "SN9", {portInState("OK")}}, {"", "", {}}}, rows),

@@ -20,6 +20,27 @@ constexpr const char* UNIT_OF_EACH_CLASS = R"({"cards": [{"model": "TVX1", "seri
              {"first": 2, "type": "printer"}, {"first": 3, "type": "array"},
              {"first": 4, "type": "object"}]}]}]}]})";
 
+/// The classes that need a scan, and how many instances that host has of each.
+const std::map<std::string, std::size_t> SAN_CLASSES = {
+    {"TVXHBA_SCSIProtocolEndpoint", 5},
+    {"TVXHBA_LocalHostedAccessPoint", 5},
+    {"TVXHBA_StorageVolume", 1},
+    {"TVXHBA_TapeDrive", 1},
+    {"TVXHBA_StorageExtent", 1},
+    {"TVXHBA_SCSIArbitraryLogicalUnit", 1},
+    {"TVXHBA_LogicalDisk", 1},
+    {"TVXHBA_StorageVolumeSystemDevice", 1},
+    {"TVXHBA_TapeDriveSystemDevice", 1},
+    {"TVXHBA_StorageExtentSystemDevice", 1},
+    {"TVXHBA_SCSIArbitraryLogicalUnitSystemDevice", 1},
+    {"TVXHBA_LogicalDiskSystemDevice", 1},
+    {"TVXHBA_SCSIInitiatorTargetStorageVolumePath", 1},
+    {"TVXHBA_SCSIInitiatorTargetTapeDrivePath", 1},
+    {"TVXHBA_SCSIInitiatorTargetStorageExtentPath", 1},
+    {"TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath", 1},
+    {"TVXHBA_SCSIInitiatorTargetLogicalDiskPath", 1},
+};
+
 std::string volumes(int count) {
   return R"({"cards": [{"model": "TVX1", "serial_number": "SN1", "ports": [
     {"wwpn": "10:00:02:54:56:0C:30:01", "targets": [{"wwpn": "50:0C:0F:F1:2A:00:10:01",
@@ -52,26 +73,7 @@ class San : public Provider_Test {
 
 TEST_F(San, EachClassHasTheInstancesOfItsUnits) {
   loadHost(UNIT_OF_EACH_CLASS);
-  const std::map<std::string, std::size_t> wanted = {
-      {"TVXHBA_SCSIProtocolEndpoint", 5},
-      {"TVXHBA_LocalHostedAccessPoint", 5},
-      {"TVXHBA_StorageVolume", 1},
-      {"TVXHBA_TapeDrive", 1},
-      {"TVXHBA_StorageExtent", 1},
-      {"TVXHBA_SCSIArbitraryLogicalUnit", 1},
-      {"TVXHBA_LogicalDisk", 1},
-      {"TVXHBA_StorageVolumeSystemDevice", 1},
-      {"TVXHBA_TapeDriveSystemDevice", 1},
-      {"TVXHBA_StorageExtentSystemDevice", 1},
-      {"TVXHBA_SCSIArbitraryLogicalUnitSystemDevice", 1},
-      {"TVXHBA_LogicalDiskSystemDevice", 1},
-      {"TVXHBA_SCSIInitiatorTargetStorageVolumePath", 1},
-      {"TVXHBA_SCSIInitiatorTargetTapeDrivePath", 1},
-      {"TVXHBA_SCSIInitiatorTargetStorageExtentPath", 1},
-      {"TVXHBA_SCSIInitiatorTargetArbitraryLogicalUnitPath", 1},
-      {"TVXHBA_SCSIInitiatorTargetLogicalDiskPath", 1},
-  };
-  for (const auto& [name, count] : wanted) EXPECT_EQ(instances(name).size(), count) << name;
+  for (const auto& [name, count] : SAN_CLASSES) EXPECT_EQ(instances(name).size(), count) << name;
 }
 
 TEST_F(San, UnitIsFoundByItsPath) {
@@ -147,12 +149,31 @@ TEST_F(San, SystemHasTheEndpointsAndTheDevices) {
   }
 }
 
-TEST_F(San, AdapterClassesStartNoScanWhereItIsOnDemand) {
+TEST_F(San, OtherClassesStartNoScanWhereItIsOnDemand) {
   writeFile("etc/torvex_fc_provider.conf", SCAN_ON_DEMAND);
-  loadHost(volumes(4));
-  EXPECT_EQ(instances("TVXHBA_FCPort").size(), 1u);
-  EXPECT_EQ(instances("TVXHBA_Card").size(), 1u);
-  EXPECT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), 0u);
+  loadHost(UNIT_OF_EACH_CLASS);
+  std::size_t asked = 0;
+  for (const std::string& name : servedClasses()) {
+    if (SAN_CLASSES.contains(name)) continue;
+    instances(name);
+    asked++;
+  }
+  EXPECT_EQ(asked, 152u - 17u);
+  EXPECT_EQ(tvxsim_calls("HBA_GetFcpTargetMapping", nullptr), 0u);
+  EXPECT_EQ(tvxsim_calls("HBA_SendScsiInquiry", nullptr), 0u);
+}
+
+TEST_F(San, EachOfItsClassesStartsTheScanThatItNeeds) {
+  writeFile("etc/torvex_fc_provider.conf", SCAN_ON_DEMAND);
+  for (const auto& [name, count] : SAN_CLASSES) {
+    loadHost(UNIT_OF_EACH_CLASS);
+    EXPECT_EQ(instances("TVXHBA_FCPort").size(), 1u);
+    EXPECT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), 0u);
+    EXPECT_EQ(instances(name).size(), count) << name;
+    // One scan: the disk tells its capacity, the others have none and are asked three times.
+    EXPECT_EQ(tvxsim_calls("HBA_SendReadCapacity", nullptr), 1u + 4u * 3u) << name;
+    unload();
+  }
 }
 
 TEST_F(San, FirstReaderScansAndTheNextOnesAreServedFromMemory) {

@@ -1,5 +1,6 @@
 // Targets and logical units: mapping, SCSI commands, attributes.
 #include <array>
+#include <chrono>
 
 #include "sim/Libraries.h"
 
@@ -177,6 +178,61 @@ TEST_F(San, OneCommandOfOneUnitCanFailWithItsSense) {
   EXPECT_EQ(sense[2], 6);
   EXPECT_EQ(inquire(target, fcp_lun({0, 1}), 1, 0x83), 9u);
   EXPECT_EQ(inquire(target, fcp_lun({0, 1}), 1, 0x83), 0u);
+}
+
+TEST_F(San, IdentifiersAreOfAnyTypeAndLength) {
+  ASSERT_EQ(tvxsim_load_text(R"({"cards": [{"model": "TVX16001", "ports": [{"targets": [
+      {"wwpn": "500C0FF000000001", "luns": [
+        {"first": 0, "identifier": {"type": 15, "length": 255, "hex": "AB"}},
+        {"first": 1, "identifier": {"type": 0, "length": 0}},
+        {"first": 2, "identifier": {"type": 8, "code_set": 3, "hex": "6971"}}]}]}]}]})"),
+            0)
+      << tvxsim_last_error();
+  handle = open("Torvex-TVX16001-1");
+  ASSERT_EQ(inquire(target, fcp_lun({0, 0}), 1, 0x83), 0u);
+  EXPECT_EQ(response[5], 15);
+  EXPECT_EQ(response[7], 255);
+  EXPECT_EQ(response[8], 0xAB);
+  EXPECT_EQ(response[2] * 256 + response[3], 4 + 255);
+  ASSERT_EQ(inquire(target, fcp_lun({0, 1}), 1, 0x83), 0u);
+  EXPECT_EQ(response[5], 0);
+  EXPECT_EQ(response[7], 0);
+  ASSERT_EQ(inquire(target, fcp_lun({0, 2}), 1, 0x83), 0u);
+  EXPECT_EQ(response[4], 3);
+  EXPECT_EQ(text(8, 2), "iq");
+}
+
+TEST_F(San, APageLongerThanTheRoomIsCutToTheRoom) {
+  std::string page;
+  for (int i = 0; i < 300; i++) page += "5A";
+  ASSERT_EQ(tvxsim_load_text((R"({"cards": [{"model": "TVX16001", "ports": [{"targets": [
+      {"wwpn": "500C0FF000000001", "luns": {"pages": {"0x83": ")" +
+                              page + R"("}}}]}]}]})")
+                                 .c_str()),
+            0)
+      << tvxsim_last_error();
+  handle = open("Torvex-TVX16001-1");
+  ASSERT_EQ(inquire(target, fcp_lun({0, 0}), 1, 0x83), 0u);
+  EXPECT_EQ(response[254], 0x5A);
+  EXPECT_EQ(response[255], 0) << "one behind the room that the library was told";
+}
+
+TEST_F(San, AMappingCanStayStale) {
+  fault(R"({"call": "HBA_GetFcpTargetMapping", "status": 8})");
+  for (int tries = 0; tries < 3; tries++) {
+    EXPECT_EQ(map(256)->NumberOfEntries, 256u) << "the room stays as it was told";
+    EXPECT_EQ(status, HBA_STATUS_ERROR_STALE_DATA + 0u);
+    SIM_CALL(hba, HBA_RefreshInformation, handle);
+  }
+}
+
+TEST_F(San, ADelayIsThatOfOneCommandOfOneUnit) {
+  fault(R"({"call": "HBA_SendScsiInquiry", "lun": 1, "page": "0x83", "delay_ms": 20})");
+  using Clock = std::chrono::steady_clock;
+  const auto start = Clock::now();
+  EXPECT_EQ(inquire(target, fcp_lun({0, 1}), 1, 0x83), 0u);
+  EXPECT_GE(Clock::now() - start, std::chrono::milliseconds(20));
+  EXPECT_EQ(response[1], 0x83) << "the answer is the same";
 }
 
 TEST_F(San, AHundredThousandUnitsAreMapped) {
