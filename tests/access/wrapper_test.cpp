@@ -247,6 +247,77 @@ TEST_F(Wrapper, TraceLevelAndQosPassThrough) {
   EXPECT_EQ(TVX_MethodWrapper::GetQosInfo(&WWN, nullptr), 4);
 }
 
+TEST_F(Wrapper, AParameterIsHandedOnWithItsControlWord) {
+  provideLocal(0, 1);
+  std::string text;
+  std::uint32_t word = 99;
+  libraries.provide(LRM_SetDriverParam, [&](HBA_WWN wwpn, const char* given, std::uint32_t bits) {
+    EXPECT_EQ(std::memcmp(&wwpn, &WWN, sizeof wwpn), 0);
+    text = given;
+    word = bits;
+    return 0;
+  });
+  for (const std::uint32_t cw1 : {0U, 1U})
+    for (const std::uint32_t cw2 : {0U, 1U}) {
+      EXPECT_EQ(TVX_MethodWrapper::tvxcimSetDriverParam("41", &WWN, cw1, cw2, "depth", "64"), 0);
+      EXPECT_EQ(text, "depth=64");
+      EXPECT_EQ(word, 2 * cw1 + cw2);
+    }
+}
+
+TEST_F(Wrapper, ParametersAreAskedForWithRoomForFiftyTwo) {
+  std::vector<std::uint32_t> told;
+  const auto answer = [&](HBA_WWN wwpn, RM_DriverParam* params, std::uint32_t* count) {
+    EXPECT_EQ(std::memcmp(&wwpn, &WWN, sizeof wwpn), 0);
+    EXPECT_NE(params, nullptr);
+    told.push_back(*count);
+    *count = told.size() == 1 ? 60 : 3;
+    return told.size() == 1 ? 7 : 0;
+  };
+  libraries.provide(LRM_GetDriverParams, answer);
+  TVX_Driver_Params params;
+  EXPECT_EQ(TVX_MethodWrapper::ReadDriverParams(WWN, TVX_Driver_Scope::LOCAL, &params), 0);
+  EXPECT_THAT(told, ElementsAre(52U, 60U));
+  EXPECT_EQ(params.count, 3U);
+}
+
+TEST_F(Wrapper, AUnitsStateIsHandedOnWithItsThreeNames) {
+  std::vector<std::uint64_t> given;
+  libraries.provide(LRM_SetOASLunState,
+                    [&](HBA_WWN initiator, HBA_WWN port, HBA_WWN target, std::uint64_t lun,
+                        std::uint8_t state, std::uint32_t option) {
+                      given = {initiator.wwn[7], port.wwn[7], target.wwn[7], lun, state, option};
+                      return 0;
+                    });
+  EXPECT_EQ(TVX_MethodWrapper::SetOASLunState("1000000000000001", "1000000000000002",
+                                              "1000000000000003", "17", 1, 0),
+            0);
+  EXPECT_THAT(given, ElementsAre(1, 2, 3, 17, 1, 0));
+  EXPECT_EQ(TVX_MethodWrapper::SetOASLunState("1000000000000001", "1000000000000002",
+                                              "1000000000000003", "255", 0, 1),
+            0);
+  EXPECT_THAT(given, ElementsAre(1, 2, 3, 255, 0, 1));
+}
+
+TEST_F(Wrapper, ListOfUnitsIsAskedForWithRoomForOne) {
+  std::vector<std::uint64_t> given;
+  libraries.provide(LRM_GetOASLunList, [&](HBA_WWN initiator, HBA_WWN port, HBA_WWN target,
+                                           std::uint32_t option, RM_OASLunList* list) {
+    for (const std::uint64_t value :
+         {std::uint64_t{initiator.wwn[7]}, std::uint64_t{port.wwn[7]}, std::uint64_t{target.wwn[7]},
+          std::uint64_t{option}, std::uint64_t{list->count}})
+      given.push_back(value);
+    const bool first = list->count == 1;
+    list->count = 2;
+    return first ? 7 : 0;
+  });
+  TVX_Block list;
+  EXPECT_EQ(TVX_MethodWrapper::GetOASLunList("1000000000000001", "1000000000000002",
+                                             "1000000000000003", 1, &list),
+            0);
+  EXPECT_THAT(given, ElementsAre(1, 2, 3, 1, 1, 1, 2, 3, 1, 2));
+}
+
 TEST_F(Wrapper, FeaturesAreLoggedEvery32Bytes) {
   libraries.provide(LRM_GetHBAFeatureList, [](HBA_WWN, std::uint32_t size, std::uint8_t* out) {
     EXPECT_EQ(size, 512U);

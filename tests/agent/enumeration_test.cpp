@@ -120,10 +120,13 @@ TEST_F(Enumeration, RefusedCopyDeliversNothingInAnyForm) {
   Delivered delivered;
   agent.enumInstances(agent.m_TVXHBA_FCPort_map, delivered.handler());
   EXPECT_EQ(log.level("Insert failed for 1"), TVX_CRIT);
+  log.clear();
   agent.enumActiveInstances(agent.m_TVXHBA_FCPort_map, delivered.handler(), noUpdate);
+  EXPECT_EQ(log.level("Insert failed for 1"), TVX_CRIT);
+  log.clear();
   agent.enumSANInstances(agent.m_TVXHBA_FCPort_map, delivered.handler());
+  EXPECT_EQ(log.level("Insert failed for 1"), TVX_CRIT);
   EXPECT_EQ(delivered.size(), 0u);
-  EXPECT_EQ(log.count("Insert failed for 1"), 3u);
   probeLocks();
   EXPECT_TRUE(everyLockWasFree);
 }

@@ -231,6 +231,20 @@ TEST_F(Tree, AFailedReadRetainsTheOldStatistics) {
   EXPECT_EQ(dynamic_cast<FCPortStatistics*>(port().m_pStatistics)->counter(0x406), 5U);
 }
 
+TEST_F(Tree, AGoodReadReplacesTheOldStatistics) {
+  auto& statistics = host.adapters[0].ports[0].statistics;
+  statistics[0x406] = rawBytes(std::uint64_t{5});
+  port().m_pStatistics = new Throwing<PortStatistics>;
+  const PortStatistics* fresh = port().refreshStatistics();
+  EXPECT_TRUE(capture.has(TVX_DBG, "FC Port statistics deletion failed!!!")) << "the old ones";
+  EXPECT_EQ(port().m_pStatistics, fresh);
+  statistics[0x406] = rawBytes(std::uint64_t{6});
+  const auto* next = dynamic_cast<const FCPortStatistics*>(port().refreshStatistics());
+  ASSERT_NE(next, nullptr);
+  EXPECT_EQ(port().m_pStatistics, next);
+  EXPECT_EQ(next->counter(0x406), 6U);
+}
+
 TEST_F(Tree, APortWithoutAValidNameHasNoStatistics) {
   port().m_Name = "bad";
   EXPECT_THROW(port().refreshStatistics(), std::exception);

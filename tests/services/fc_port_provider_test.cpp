@@ -1,6 +1,7 @@
 // The provider of FC ports and its beacon; what active classes answer without their libraries.
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
+#include "Lock_Witness.h"
 #include "access/TVX_MethodWrapper.h"
 #include "services/TVXHBA_DriverParamGlobal_Provider.h"
 #include "services/TVXHBA_DriverParams_Provider.h"
@@ -143,6 +144,15 @@ TEST_F(FC_Port_Provider, IndicatorIsKeptThoughTheHardwareFails) {
   EXPECT_EQ(numberOf(entry().LocationIndicator), 2);
   EXPECT_EQ(log.level("Failed to set the beacon state to 3 "), TVX_DBG);
 }
+
+#ifndef NDEBUG  // locks are only booked in debug builds
+TEST_F(FC_Port_Provider, BeaconIsSwitchedUnderTheDataLock) {
+  build();
+  Lock_Witness witness("TVX_DiagTestFunc::SetBeaconState");
+  EXPECT_EQ(modify(2), 0);
+  EXPECT_TRUE(witness.wasHeld);
+}
+#endif
 
 TEST_F(FC_Port_Provider, OtherIndicatorsAreRefused) {
   build();

@@ -1,6 +1,7 @@
 // Optimized access storage: units found by the scan, made, deleted and switched off.
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
+#include "Lock_Witness.h"
 #include "access/TVX_MethodWrapper.h"
 #include "agent/Map_Insert.h"
 #include "agent/ProductSteps.h"
@@ -36,6 +37,12 @@ std::string unitID(const char* option, int lun, const char* target = TARGET,
 
 void* noMemory(std::size_t) {
   return nullptr;
+}
+
+std::vector<std::size_t> sizes;
+void* notedMemory(std::size_t size) {
+  sizes.push_back(size);
+  return std::calloc(1, size);
 }
 
 class Optimized_Access : public Agent_Test {
@@ -271,6 +278,42 @@ TEST_F(Optimized_Access, ListIsReadAgainWithTheRoomThatItNeeds) {
   EXPECT_EQ(listed(1), (std::vector<int>{0, 200}));
 }
 
+TEST_F(Optimized_Access, ListHasRoomForOneUnitAndThenForAll) {
+  build(MARKED);
+  sizes.clear();
+  tvxSetAllocator(notedMemory);
+  EXPECT_EQ(listed(1), (std::vector<int>{0, 200}));
+  addFault(R"({"call": "LRM_GetOASLunList", "status": 191, "returned_size": 200, "nth": 1})");
+  listed(0);
+  EXPECT_EQ(sizes, (std::vector<std::size_t>{40, 36 + 40, 40, 199 * 36 + 40}));
+}
+
+TEST_F(Optimized_Access, EveryUnitOfAListIsTold) {
+  build(MARKED);
+  log.clear();
+  EXPECT_EQ(listed(1), (std::vector<int>{0, 200}));
+  const std::vector<std::string> lines = {"FCP Lun: 0",        "OAS Lun: 0",   "OAS State: 1",
+                                          "FCP Lun: 200",      "OAS Lun: 200", "OAS State: 200",
+                                          "Exit GetOASLunList"};
+  EXPECT_EQ(log.only(lines), lines);
+  for (const std::string& line : lines) EXPECT_EQ(log.level(line), TVX_DBG) << line;
+}
+
+TEST_F(Optimized_Access, ListThatStaysTooSmallIsAFailure) {
+  build(MARKED);
+  log.clear();
+  addFault(R"({"call": "LRM_GetOASLunList", "status": 7, "returned_size": 2})");
+  TVX_Block block;
+  EXPECT_EQ(TVX_MethodWrapper::GetOASLunList(PORT, PORT, TARGET, 1, &block), 7);
+  EXPECT_FALSE(block);
+  EXPECT_EQ(log.level("RM_GetOASLunList error."), TVX_ERR);
+  const std::vector<Logged> lines = log.all();
+  ASSERT_GE(lines.size(), 2u);
+  EXPECT_EQ(lines[lines.size() - 2].text.substr(0, 12), "Status: <7>:");
+  EXPECT_EQ(lines[lines.size() - 2].level, TVX_DBG);
+  EXPECT_EQ(lines.back().text, "Exit GetOASLunList");
+}
+
 TEST_F(Optimized_Access, CountBeyondTheRoomIsCutToTheRoom) {
   build(R"("oas": [{"target": "50060E801049CF51", "lun": 9, "option": "driver"}])");
   addFault(R"({"call": "LRM_GetOASLunList", "returned_size": 4000000000})");
@@ -311,8 +354,20 @@ TEST_F(Optimized_Access, StateOfAUnitIsSetByItsDecimalNumber) {
             TVX_DBG);
   EXPECT_EQ(TVX_MethodWrapper::SetOASLunState(PORT, PORT, TARGET, nullptr, 1, 0), 1);
   EXPECT_EQ(TVX_MethodWrapper::SetOASLunState("short", PORT, TARGET, "1", 1, 0), 1);
+  EXPECT_EQ(log.level("str2HBAName failed"), TVX_ERR);
+  log.clear();
+  for (const auto& [initiator, port, target] :
+       {std::tuple{PORT, "short", TARGET}, {PORT, PORT, "short"}}) {
+    EXPECT_EQ(TVX_MethodWrapper::SetOASLunState(initiator, port, target, "1", 1, 0), 1);
+  }
+  EXPECT_EQ(log.count("str2HBAName failed"), 2u);
+  EXPECT_EQ(TVX_MethodWrapper::SetOASLunState(nullptr, PORT, TARGET, "1", 1, 0), 1);
+  EXPECT_EQ(log.level("Id2HBAName failed"), TVX_ERR);
+  EXPECT_EQ(listed(0), std::vector<int>{10});
   EXPECT_EQ(TVX_MethodWrapper::SetOASLunState(PORT, PORT, TARGET, "1", 1, 5), 1);
   EXPECT_EQ(log.level(" Operation failure. OAS State has not been set"), TVX_ERR);
+  EXPECT_EQ(log.all().back().text.substr(0, 12), "Status: <1>:");
+  EXPECT_EQ(log.all().back().level, TVX_DBG);
 }
 
 // --- Creation
@@ -372,6 +427,11 @@ TEST_F(Optimized_Access, CreationRefusesWhatNamesNoUnit) {
   EXPECT_EQ(log.level("TVXHBA_DriverParams_Provider::Duplicate instance found."), TVX_ERR);
   EXPECT_EQ(create(""), 82);
   EXPECT_EQ(log.level("InstanceID size = 0, OAS parameter not found in InstanceID: "), TVX_ERR);
+  const Ref<TVXHBA_DriverParams> nameless(TVXHBA_DriverParams::create(false));
+  EXPECT_EQ(TVXHBA_DriverParams_Provider().create_instance(nameless.get()), 82);
+  log.clear();
+  EXPECT_EQ(create("10000000000000A1:depth"), 80) << "what is there already is told first";
+  EXPECT_EQ(log.level("TVXHBA_DriverParams_Provider::Duplicate instance found."), TVX_ERR);
   EXPECT_EQ(create("TVX:SAO:Driver"), 82);
   EXPECT_EQ(log.level("InstanceID size = 0, OAS parameter not found in InstanceID: TVX:SAO:Driver"),
             TVX_ERR);
@@ -381,6 +441,42 @@ TEST_F(Optimized_Access, CreationRefusesWhatNamesNoUnit) {
   EXPECT_EQ(log.count("TVXHBA_DriverParams_Provider::SetOASLunState failed"), 0u);
   EXPECT_EQ(tvxsim_calls("LRM_SetOASLunState", nullptr), 0u);
 }
+
+TEST_F(Optimized_Access, CreatedUnitIsFoundAgainByTheScanOfTheNextRefresh) {
+  build();
+  ASSERT_EQ(create(unitID("Driver", 1)), 0);
+  turnClock(5'000'000);
+  refresh(*agent);
+  const TVXHBA_DriverParams* entry = unit(unitID("Driver", 1));
+  ASSERT_TRUE(entry);
+  EXPECT_EQ(numberOf(entry->current), 1);
+  EXPECT_TRUE(unit("10000000000000A1:depth"));
+  EXPECT_EQ(agent->m_TVXHBA_DriverParams_map.size(), 2u);
+  EXPECT_EQ(agent->m_TVXHBA_DriverServiceElementSettingData_map.size(), 2u);
+  EXPECT_EQ(agent->m_TVXHBA_DriverParameterAffectsFCPort_map.size(), 0u);
+}
+
+#ifndef NDEBUG  // locks are only booked in debug builds
+TEST_F(Optimized_Access, UnitsAreChangedUnderTheDataLock) {
+  build();
+  const auto stateText = [](int state) {
+    return "Enter TVX_MethodWrapper:SetOASLunState Input OASState: " + std::to_string(state) +
+           ", Lun no: 1, option: 0";
+  };
+  Lock_Witness creation(stateText(1));
+  ASSERT_EQ(create(unitID("Driver", 1)), 0);
+  EXPECT_TRUE(creation.wasHeld);
+  {
+    Lock_Witness deletion(stateText(0));
+    ASSERT_EQ(remove(unitID("Driver", 1)), 0);
+    EXPECT_TRUE(deletion.wasHeld);
+  }
+  ASSERT_EQ(create(unitID("Driver", 1)), 0);
+  Lock_Witness method(stateText(0));
+  EXPECT_EQ(disableAll(), 0u);
+  EXPECT_TRUE(method.wasHeld);
+}
+#endif
 
 TEST_F(Optimized_Access, CreationRefusesShortAndMalformedNames) {
   build();
@@ -482,6 +578,14 @@ TEST_F(Optimized_Access, OfTiesSideBySideTheSecondStays) {
   EXPECT_EQ(ties.size(), 2u);
   EXPECT_TRUE(dropOasAssociations(*agent, *entry));
   EXPECT_EQ(ties.size(), 1u);
+  EXPECT_EQ(log.count("Got the related Driver Element Setting Data"), 2u);
+  auto& ports = agent->m_TVXHBA_DriverParameterAffectsFCPort_map;
+  for (const Instance* other : {static_cast<const Instance*>(agent->m_TVXHBA_FCPort_map[0]),
+                                static_cast<const Instance*>(agent->m_TVXHBA_Chip_map[0])})
+    ports.insert(makeAssociation<TVXHBA_DriverParameterAffectsFCPort>(other, entry).release());
+  ASSERT_EQ(ports.size(), 2u);
+  EXPECT_TRUE(dropOasAssociations(*agent, *entry));
+  EXPECT_EQ(ports.size(), 1u);
 }
 
 // --- All of a target
@@ -548,7 +652,8 @@ TEST_F(Optimized_Access, DisablingAllNeedsAKnownServiceAndPort) {
   EXPECT_EQ(disableAll(nullptr, TARGET), 32968u);
   EXPECT_EQ(disableAll(PORT, nullptr), 32968u);
   EXPECT_EQ(disableAll("", TARGET), 32968u);
-  EXPECT_EQ(log.count("Invalid Initiator fc port or Target device"), 3u);
+  EXPECT_EQ(disableAll(PORT, ""), 32968u);
+  EXPECT_EQ(log.count("Invalid Initiator fc port or Target device"), 4u);
   EXPECT_EQ(log.level("Invalid Initiator fc port or Target device"), TVX_ERR);
   EXPECT_EQ(disableAll("10000000000000FF"), 32968u);
   EXPECT_EQ(log.level("Invald fc port."), TVX_ERR);
