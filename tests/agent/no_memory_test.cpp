@@ -1,6 +1,6 @@
 // What the builders of the maps say when memory runs out.
 #include "../logs/Failing_New.h"
-#include "Map_Test.h"
+#include "San_Test.h"
 #include "agent/Associations.h"
 #include "agent/MapSteps.h"
 #include "agent/ProductSteps.h"
@@ -8,7 +8,7 @@
 namespace cimrt::test {
 namespace {
 
-class No_Memory : public Adapter_Maps {
+class No_Memory : public San_Maps {
  protected:
   /// Builds the PCI device of the first port again, short of blocks of that size but for
   /// `spare` of them.
@@ -58,6 +58,48 @@ TEST_F(No_Memory, EveryKindOfAssociationTellsThatItCouldNotBeMade) {
     }
     EXPECT_EQ(log.level(rule.creationFailure), TVX_CRIT) << rule.className;
   }
+}
+
+TEST_F(No_Memory, UnitThatCannotBeMadeEndsTheSANBuildWithWhatThereIs) {
+  ProviderAgent& agent = buildUnits(R"({"count": 3})");
+  std::int32_t result = 0;
+  {
+    // The first unit takes two: its own instance, and the end that its associations share.
+    const Failing_New failing(TVXHBA_StorageVolume::static_meta_class.size, 2);
+    result = rebuildSAN(agent);
+  }
+  EXPECT_EQ(result, 0x8001);
+  EXPECT_EQ(log.level("Error updating SAN maps"), TVX_ERR);
+  const std::vector<std::size_t> sizes = sizesOf(agent);
+  EXPECT_EQ(std::vector(sizes.begin(), sizes.begin() + 5),
+            (std::vector<std::size_t>{2, 2, 1, 1, 1}));
+}
+
+TEST_F(No_Memory, ReadersGetNothingAndLeaveTheLocksFree) {
+  ProviderAgent& agent = build();
+  ASSERT_EQ(agent.m_TVXHBA_FCPort_map.size(), 4u);
+  Delivered delivered;
+  {
+    // The second copy cannot be made.
+    const Failing_New failing(TVXHBA_FCPort::static_meta_class.size, 1);
+    agent.enumInstances(agent.m_TVXHBA_FCPort_map, delivered.handler());
+  }
+  EXPECT_EQ(log.level("Exception in CIM Provider Enumeration - do nothing"), TVX_CRIT);
+  {
+    const Failing_New failing(TVXHBA_FCPort::static_meta_class.size, 1);
+    agent.enumActiveInstances(agent.m_TVXHBA_FCPort_map, delivered.handler(),
+                              [](ProviderAgent&) {});
+  }
+  EXPECT_EQ(log.level("Exception in Active CIM Provider Enumeration - do nothing"), TVX_CRIT);
+  {
+    const Failing_New failing(TVXHBA_FCPort::static_meta_class.size, 1);
+    agent.enumSANInstances(agent.m_TVXHBA_FCPort_map, delivered.handler());
+  }
+  EXPECT_EQ(log.level("Exception in SAN CIM Provider Enumeration - do nothing"), TVX_CRIT);
+  EXPECT_EQ(delivered.size(), 0u);
+  for (Ranked_Mutex* mutex : {&agent.m_AdapterDataReadyMutex, &agent.m_AdapterMapsReadyMutex,
+                              &agent.m_SANMapsReadyMutex, &agent.m_DataMutex})
+    EXPECT_TRUE(isFree(*mutex));
 }
 
 TEST_F(No_Memory, DiagnosticsThatCannotBeMadeDoNotEndTheBuild) {
