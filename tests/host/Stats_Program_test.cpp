@@ -1,5 +1,6 @@
 // `tvxcim --sim stats` as a person runs it.
 #include <nlohmann/json.hpp>
+#include <sstream>
 
 #include "Simulated_Program.h"
 
@@ -58,6 +59,25 @@ TEST_F(StatsProgramTest, WatchesSoManySamples) {
   EXPECT_EQ(result.exitCode, 0) << result.err;
   EXPECT_EQ(occurrences(result.out, "TX FRAMES/S"), 3U) << result.out;
   EXPECT_EQ(lines(result.out), 15U) << result.out;
+}
+
+TEST_F(StatsProgramTest, WatchingShowsTheRatesBetweenTwoReadings) {
+  const std::string words = "stats 10000254560C5001 --watch 0.3 --count 2";
+  const test::Outcome result = run("--sim live --json " + words, "LD_PRELOAD=" FAST_CLOCK);
+  ASSERT_EQ(result.exitCode, 0) << result.err;
+  std::istringstream samples(result.out);
+  nlohmann::json first;
+  nlohmann::json second;
+  samples >> first >> second;
+  EXPECT_TRUE(first["ports"][0]["perSecond"]["BytesTransmitted"].is_null());
+  const auto& rates = second["ports"][0]["perSecond"];
+  const double sent = rates["BytesTransmitted"];
+  EXPECT_GT(sent, 2e7) << "of 25,000,000 words a second";
+  EXPECT_LT(sent, 5e8);
+  EXPECT_DOUBLE_EQ(rates["BytesReceived"], 2 * sent);
+  const test::Outcome table = run("--sim live " + words, "LD_PRELOAD=" FAST_CLOCK);
+  ASSERT_EQ(lines(table.out), 4U) << table.out << table.err;
+  EXPECT_EQ(occurrences(table.out, " MB/s"), 2U) << table.out;
 }
 
 TEST_F(StatsProgramTest, WatchingEndsWithASignalAndUnloadsTheLibrary) {

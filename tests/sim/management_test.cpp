@@ -45,6 +45,47 @@ TEST_F(Management, HeldClockMovesCountersOnlyWhenItIsPutForward) {
   EXPECT_GE(frames(), 130u);
 }
 
+TEST_F(Management, ShippedScenarioHasAllThatMovesIsMissingOrFails) {
+  load("live");
+  tvxsim_hold_clock(1);
+  const HBA_WWN moving = wwn(0x10000254560C5001ULL);
+  const HBA_WWN failing = wwn(0x10000254560C5002ULL);
+  const HBA_WWN older = wwn(0x10000254560A8001ULL);
+  const HBA_WWN target = wwn(0x50060E801049CF51ULL);
+  Block block(rm, RM_PORT_STATISTICS_SIZE);
+  const auto read = [&](const HBA_WWN& port) {
+    block.size = RM_PORT_STATISTICS_SIZE;
+    return SIM_CALL(rm, LRM_GetPortStatistics, port, block.data(), &block.size);
+  };
+  std::uint64_t words = 1000000;
+  for (const std::uint64_t errors : {0, 1, 1, 5, 5}) {
+    ASSERT_EQ(read(moving), 0);
+    EXPECT_EQ(block.u64(RM_PS_CRC_ERRORS), errors);
+    EXPECT_EQ(block.u64(RM_PS_TX_WORDS), words);
+    EXPECT_EQ(block.u64(RM_PS_NOS_COUNT), UINT64_MAX);
+    EXPECT_FALSE(block.has(RM_PS_DUMPED_FRAMES));
+    tvxsim_advance(10);
+    words += 250000000;
+  }
+  for (const RM_STATUS status : {0, 0, 148, 0}) {
+    EXPECT_EQ(read(failing), status);
+    EXPECT_EQ(read(older), 0);
+  }
+  std::vector<RM_DriverParam> params(52);
+  std::uint32_t count = 52;
+  EXPECT_EQ(SIM_CALL(rm, LRM_GetDriverParams, older, params.data(), &count), RM_ERROR_MORE_DATA);
+  EXPECT_EQ(count, 60u);
+  for (const std::uint32_t option : {0u, 1u}) {
+    RM_OASLunList list{};
+    list.count = 0;
+    EXPECT_EQ(SIM_CALL(rm, LRM_GetOASLunList, moving, moving, target, option, &list),
+              RM_ERROR_MORE_DATA);
+    EXPECT_EQ(list.count, 2u);
+    EXPECT_EQ(SIM_CALL(rm, LRM_GetOASLunList, older, older, target, option, &list),
+              RM_ERROR_NOT_SUPPORTED);
+  }
+}
+
 TEST_F(Management, AllCountersOfTheInterfaceAreThere) {
   Block block(rm, RM_PORT_STATISTICS_SIZE);
   ASSERT_EQ(SIM_CALL(rm, LRM_GetPortStatistics, first_port, block.data(), &block.size), 0);
