@@ -14,8 +14,8 @@ TVXHBA_JobSettingData* TVX_Diagnostics::getTVXHBA_JobSettingDataInstance(const I
                                                                          const char* testName) {
   TVXHBA_JobSettingData* settings = getDefaultTVXHBA_JobSettingDataInstance(testName);
   const auto* wanted = typed<TVXHBA_JobSettingData>(given);
-  if (!wanted || !settings) return nullptr;
-  if (!wanted->InstanceID.value.equal(settings->InstanceID.value)) return nullptr;
+  if (!wanted) return nullptr;
+  if (settings && !wanted->InstanceID.value.equal(settings->InstanceID.value)) return nullptr;
   TVX_LOG(TVX_DBG, "Using the overrided values if valid, else default settings values are used");
   if (wanted->DeleteOnCompletion.is_null()) {
     TVX_LOG(TVX_DBG,
@@ -23,7 +23,7 @@ TVXHBA_JobSettingData* TVX_Diagnostics::getTVXHBA_JobSettingDataInstance(const I
             "value");
     return settings;
   }
-  settings->DeleteOnCompletion = wanted->DeleteOnCompletion;
+  if (settings) settings->DeleteOnCompletion = wanted->DeleteOnCompletion;
   return settings;
 }
 

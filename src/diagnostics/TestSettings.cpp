@@ -108,7 +108,6 @@ void overridePatternSettings(const Settings& given, Settings& settings) {
   if (!given.HaltOnError.is_null()) settings.HaltOnError = given.HaltOnError;
   for (int pass = 0; pass < 2; pass++)
     for (const auto check : CHECKS) check(over);
-  settings.OverridedSettingData.set(1);
 }
 
 void overrideTargetDevice(const Settings& given, Settings& settings) {
@@ -132,20 +131,18 @@ void overrideTargetSettings(const Settings& given, Settings& settings) {
   else
     TVX_LOG(TVX_DBG, "Invalid LUN, Using the default value '0' ");
   overrideTargetDevice(given, settings);
-  settings.OverridedSettingData.set(1);
+}
+
+bool takesOverrides(const Diagnostic_Row& row) {
+  if (row.number == Diagnostic_Test::BEACON || row.sendsPattern()) return true;
+  TVX_LOG(TVX_DBG, "No Override Setting Supported for test : %s", row.name);
+  return false;
 }
 
 void overrideSettings(const Diagnostic_Row& row, const Settings& given, Settings& settings) {
-  if (row.number == Diagnostic_Test::BEACON) {
-    settings.OverridedSettingData.set(1);
-    return;
-  }
-  if (!row.sendsPattern()) {
-    TVX_LOG(TVX_DBG, "No Override Setting Supported for test : %s", row.name);
-    return;
-  }
-  overridePatternSettings(given, settings);
+  if (row.sendsPattern()) overridePatternSettings(given, settings);
   if (row.needsTarget()) overrideTargetSettings(given, settings);
+  settings.OverridedSettingData.set(1);
 }
 
 }  // namespace
@@ -167,10 +164,10 @@ Settings* TVX_Diagnostics::getTVXHBA_FCHBADiagnosticSettingDataInstance(const In
     TVX_LOG(TVX_DBG, "Invalid overrided Diagsetting param, default settings values are used");
     return nullptr;
   }
-  if (!settings || !wanted->InstanceID.value.equal(settings->InstanceID.value)) return nullptr;
+  if (settings && !wanted->InstanceID.value.equal(settings->InstanceID.value)) return nullptr;
   TVX_LOG(TVX_DBG, "Using the overrided values if valid, else default settings values are used");
-  if (const Diagnostic_Row* row = findDiagnosticTest(testName))
-    overrideSettings(*row, *wanted, *settings);
+  const Diagnostic_Row* row = findDiagnosticTest(testName);
+  if (row && takesOverrides(*row) && settings) overrideSettings(*row, *wanted, *settings);
   return settings;
 }
 

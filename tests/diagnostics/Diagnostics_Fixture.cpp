@@ -54,6 +54,11 @@ const struct {
     {"RM_DiagEchoTestV2", Gate_Of<&Taken_Over::echo>::stand},
     {"RM_DiagLoopBackTestV3", Gate_Of<&Taken_Over::loopback>::stand},
     {"RM_DiagPciLoopBackTestV2", Gate_Of<&Taken_Over::pciLoopback>::stand},
+    {"RM_GetHBAAttributes", Gate_Of<&Taken_Over::adapterAttributes>::stand},
+    {"RM_GetPortAttributes", Gate_Of<&Taken_Over::portAttributes>::stand},
+    {"RM_GetFcpTargetMapping", Gate_Of<&Taken_Over::targetMapping>::stand},
+    {"RM_DiagBeacon", Gate_Of<&Taken_Over::beacon>::stand},
+    {"RM_DiagBeaconState", Gate_Of<&Taken_Over::beaconState>::stand},
 };
 
 void* findSymbol(void* handle, const char* name) {
@@ -69,6 +74,21 @@ constexpr TVX_Dl_Operations OPERATIONS = {
     [](void* handle) { return dlclose(handle); }, []() -> const char* { return dlerror(); }};
 
 }  // namespace
+
+std::set<std::string> filledIn(const Instance* instance) {
+  std::set<std::string> names;
+  const Meta_Class* metaClass = class_of(instance);
+  const Ref<Instance> fresh(create(metaClass, true));
+  const auto isSet = [](const Instance* each, const Meta_Feature* feature) {
+    return *null_flag(each, feature) == 0;
+  };
+  for (std::uint64_t i = 0; i < metaClass->num_meta_features; i++) {
+    const Meta_Feature* feature = metaClass->meta_features[i];
+    if (is_property(feature) && isSet(instance, feature) && !isSet(fresh.get(), feature))
+      names.insert(feature->name);
+  }
+  return names;
+}
 
 void Diagnostics_Test::SetUp() {
   Agent_Test::SetUp();

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <functional>
+#include <set>
 #include <string>
 
 #include "../agent/Agent_Fixture.h"
@@ -40,6 +41,11 @@ struct Taken_Over {
   std::function<RM_STATUS(HBA_WWN, std::uint32_t, std::uint32_t, std::uint32_t*, std::uint32_t,
                           const char*)>
       pciLoopback;
+  std::function<RM_STATUS(HBA_WWN, void*, std::uint32_t*)> adapterAttributes;
+  std::function<RM_STATUS(HBA_WWN, void*, std::uint32_t*)> portAttributes;
+  std::function<RM_STATUS(HBA_WWN, HBA_FCPTARGETMAPPING*)> targetMapping;
+  std::function<RM_STATUS(HBA_WWN, std::uint32_t)> beacon;
+  std::function<RM_STATUS(HBA_WWN, std::uint32_t*)> beaconState;
 };
 
 /// What a run of the service gave.
@@ -47,6 +53,9 @@ struct Ran {
   std::int64_t result;
   Ref<TVXHBA_ConcreteJob> job;
 };
+
+/// The names of the properties that are not null, unless they would be so in a new instance too.
+std::set<std::string> filledIn(const Instance* instance);
 
 class Diagnostics_Test : public Agent_Test {
  protected:

@@ -1,6 +1,8 @@
 // The tests of a host as instances: every property, every association, and what happens when some
 // of them can't be made.
 #include "Diagnostics_Fixture.h"
+#include "Feature_Maps.h"
+#include "common/TVX_Clock.h"
 
 namespace cimrt::test {
 namespace {
@@ -188,12 +190,11 @@ TEST_F(Class_Feature, PatternAndTargetBelongToTheTestsThatSend) {
     }
     EXPECT_EQ(textOf(data.TargetDevice), aims ? "" : "(null)") << TESTS[i].name;
     EXPECT_EQ(textOf(data.TargetDeviceFormat), aims ? "2" : "(null)");
-    if (aims) {
-      EXPECT_EQ(numberOf(data.LUN), 0);
-    }
+    // These three have the same values in any setting data: their class gives them.
+    EXPECT_EQ(numberOf(data.LUN), 0);
+    EXPECT_EQ(numberOf(data.PingMechanism), 2);
+    EXPECT_EQ(numberOf(data.EchoMechanism), 2);
   }
-  EXPECT_EQ(numberOf(settings(PING_TEST)->PingMechanism), 2);
-  EXPECT_EQ(numberOf(settings(ECHO_TEST)->EchoMechanism), 2);
 }
 
 TEST_F(Class_Feature, CapabilitiesTellWhatATestTakes) {
@@ -255,9 +256,54 @@ TEST_F(Class_Feature, IdentitiesTellTheVersion) {
     EXPECT_EQ(textOf(identity.Description), "TVX FCHBA Diagnostics");
     EXPECT_EQ(textsOf(identity.IdentityInfoValue), Texts{TESTS[i].name});
     EXPECT_EQ(textsOf(identity.IdentityInfoType), Texts{"TORVEX:DIAGNOSTICS_NAME"});
-    EXPECT_FALSE(identity.ReleaseDate.is_null());
-    EXPECT_TRUE(identity.ReleaseDate.value.is_timestamp());
+    ASSERT_FALSE(identity.ReleaseDate.is_null());
+    EXPECT_TRUE(identity.ReleaseDate.value.equal(tvxNowDatetime())) << "the time of the build";
   }
+}
+
+TEST_F(Class_Feature, NothingElseIsFilledIn) {
+  build();
+  using Names = std::set<std::string>;
+  const Agent_Maps& maps = *agent;
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_FCHBADiagnosticTest_map[0]),
+            (Names{"SystemCreationClassName", "SystemName", "CreationClassName", "Name",
+                   "ElementName", "FCHBATestType", "TestTypes", "Characteristics"}));
+  Names settingNames = {"InstanceID",  "ElementName",       "OverridedSettingData",
+                        "HaltOnError", "ResultPersistence", "LogOptions",
+                        "LogStorage"};
+  EXPECT_EQ(filledIn(settings(SELF_TEST)), settingNames);
+  settingNames.insert({"LoopControl", "LoopControlParameter"});
+  EXPECT_EQ(filledIn(settings(BEACON_TEST)), settingNames);
+  settingNames.insert({"BufferSizes", "BufferPattern"});
+  EXPECT_EQ(filledIn(settings(HOST_LOOPBACK_TEST)), settingNames);
+  settingNames.insert({"TargetDevice", "TargetDeviceFormat"});
+  EXPECT_EQ(filledIn(settings(PING_TEST)), settingNames);
+  EXPECT_EQ(filledIn(settings(ECHO_TEST)), settingNames);
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_FCHBADiagnosticServiceCapabilities_map[1]),
+            (Names{"InstanceID", "ElementName", "SupportedServiceModes", "SupportedLogStorage",
+                   "SupportedLogOptions", "SupportedLoopControl", "SupportedExecutionControls",
+                   "OtherSupportedExecutionControlsDescriptions"}));
+  EXPECT_EQ(
+      filledIn(maps.m_TVXHBA_HelpService_map[0]),
+      (Names{"SystemCreationClassName", "SystemName", "CreationClassName", "Name", "ElementName",
+             "DeliveryOptions", "OtherDeliveryOptionDescription", "DocumentFormat",
+             "OtherDocumentFormatDescription", "DocumentsAvailable", "DocumentDescriptions"}));
+  EXPECT_EQ(
+      filledIn(maps.m_TVXHBA_DiagnosticIdentity_map[0]),
+      (Names{"Name", "InstanceID", "ElementName", "MajorVersion", "RevisionNumber", "MinorVersion",
+             "VersionString", "Manufacturer", "Classifications", "ClassificationDescriptions",
+             "Description", "IdentityInfoValue", "IdentityInfoType", "ReleaseDate"}));
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_DiagnosticsLog_map[0]),
+            (Names{"InstanceID", "ElementName", "Description", "MaxNumberOfRecords",
+                   "CurrentNumberOfRecords", "OperationalStatus", "HealthState"}));
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_JobSettingData_map[0]), (Names{"InstanceID", "ElementName"}));
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_DiagElementSettingData_map[0]), Names{"IsDefault"});
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_JobElementSettingData_map[0]), Names{"IsDefault"});
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_DiagElementSoftwareIdentity_map[0]),
+            Names{"ElementSoftwareStatus"});
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_AvailableDiagnosticService_map[0]),
+            Names{"EstimatedDurationOfService"});
+  EXPECT_EQ(filledIn(maps.m_TVXHBA_ServiceAffectsElement_map[0]), Names{});
 }
 
 TEST_F(Class_Feature, LogsAreEmptyAndLarge) {
@@ -361,6 +407,7 @@ TEST_F(Class_Feature, BuildTellsItsStepsInTheirOrder) {
   EXPECT_EQ(told, steps);
   for (const std::string& step : steps) EXPECT_EQ(log.level(step), TVX_DBG) << step;
   EXPECT_EQ(log.count("TVXHBA_DiagElementCapabilities instance (NIC) is created"), COUNT);
+  EXPECT_EQ(log.level("TVXHBA_DiagElementCapabilities instance (NIC) is created"), TVX_DBG);
 }
 
 TEST_F(Class_Feature, HostWithoutPortsHasNoTests) {
@@ -369,9 +416,9 @@ TEST_F(Class_Feature, HostWithoutPortsHasNoTests) {
   EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0x812C);
   EXPECT_EQ(log.level("Unable to create the FCHBA Diagnostic feature, No managed element exist"),
             TVX_DBG);
-  EXPECT_EQ(agent->m_TVXHBA_FCHBADiagnosticTest_map.size(), 0u);
-  EXPECT_EQ(agent->m_TVXHBA_JobSettingData_map.size(), 0u);
+  EXPECT_EQ(featureInstances(*agent), 0u);
   refresh(*agent);
+  EXPECT_EQ(featureInstances(*agent), 0u);
   EXPECT_EQ(log.level("FCHBA Diagnositcss either Not Supported/Failed to Create the feature"),
             TVX_DBG);
 }
@@ -403,7 +450,7 @@ TEST_F(Class_Feature, NamesThatCantBeConvertedLeaveNoVersion) {
   EXPECT_EQ(log.level("FCHBA Diagnostics are not supported in any of the managed element"),
             TVX_DBG);
   EXPECT_EQ(log.level("TVXHBA_DiagTestFunc::Id2HBAName failed"), TVX_ERR);
-  EXPECT_EQ(agent->m_TVXHBA_FCHBADiagnosticTest_map.size(), 0u);
+  EXPECT_EQ(featureInstances(*agent), 0u);
 }
 
 TEST_F(Class_Feature, HostWithoutASystemHasNoTests) {
@@ -412,6 +459,9 @@ TEST_F(Class_Feature, HostWithoutASystemHasNoTests) {
   diagnostics.ClearDiagnosticClassMaps(0);
   agent->m_CIM_ComputerSystem_map.clear();
   EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 40002);
+  EXPECT_EQ(log.level("FCHBA Diagnostics are not supported in any of the managed element"),
+            TVX_DBG);
+  EXPECT_EQ(featureInstances(*agent), 0u);
 }
 
 TEST_F(Class_Feature, VersionWantsAPlaceAndAName) {
@@ -427,178 +477,22 @@ TEST_F(Class_Feature, VersionWantsAPlaceAndAName) {
   EXPECT_EQ(version, 7u);
 }
 
-// --- Instances that can't be made
-
-const Meta_Class* unmakeable = nullptr;
-Instance* makeAllButOne(const Meta_Class* metaClass) {
-  return metaClass == unmakeable ? nullptr : create(metaClass, true);
-}
-
-TEST_F(Class_Feature, ATestWithAnInstanceThatCantBeMadeIsLeftOut) {
+TEST_F(Class_Feature, VersionIsReadIntoTwoKilobytes) {
   build();
-  TVX_Diagnostics diagnostics(*agent);
-  const Meta_Class* const parts[] = {
-      &TVXHBA_FCHBADiagnosticTest::static_meta_class,
-      &TVXHBA_FCHBADiagnosticSettingData::static_meta_class,
-      &TVXHBA_DiagElementSettingData::static_meta_class,
-      &TVXHBA_FCHBADiagnosticServiceCapabilities::static_meta_class,
-      &TVXHBA_DiagElementCapabilities::static_meta_class,
-      &TVXHBA_HelpService::static_meta_class,
-      &TVXHBA_ServiceAvailableToElement::static_meta_class,
-      &TVXHBA_DiagnosticIdentity::static_meta_class,
-      &TVXHBA_DiagElementSoftwareIdentity::static_meta_class,
-      &TVXHBA_JobSettingData::static_meta_class,
-      &TVXHBA_JobElementSettingData::static_meta_class,
-      &TVXHBA_DiagnosticsLog::static_meta_class,
-      &TVXHBA_UseOfLog::static_meta_class,
+  std::uint32_t told = 0;
+  taken().adapterAttributes = [&](HBA_WWN wwpn, void*, std::uint32_t* size) {
+    EXPECT_EQ(wwpn.wwn[7], 0xA1);
+    told = *size;
+    return RM_STATUS{RM_ERROR};
   };
-  setDiagnosticFactory(makeAllButOne);
-  for (const Meta_Class* part : parts) {
-    unmakeable = part;
-    log.clear();
-    diagnostics.ClearDiagnosticClassMaps(0);
-    EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0) << part->name;
-    EXPECT_EQ(agent->m_TVXHBA_FCHBADiagnosticTest_map.size(), 0u) << part->name;
-    EXPECT_EQ(agent->m_TVXHBA_HelpService_map.size(), 0u) << "nothing of the round stays";
-    for (const Expected& row : TESTS)
-      EXPECT_EQ(log.level(std::string("Failed to create the maps for ") + row.name +
-                          " ,Check the memory availablity"),
-                TVX_ERR)
-          << part->name;
-  }
-}
-
-TEST_F(Class_Feature, ATestThatCantBeOfferedForLackOfMemoryIsTold) {
-  build();
-  TVX_Diagnostics diagnostics(*agent);
-  setDiagnosticFactory(makeAllButOne);
-  for (const Meta_Class* part : {&TVXHBA_AvailableDiagnosticService::static_meta_class,
-                                 &TVXHBA_ServiceAffectsElement::static_meta_class}) {
-    unmakeable = part;
-    log.clear();
-    diagnostics.ClearDiagnosticClassMaps(0);
-    EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0);
-    EXPECT_EQ(log.level("Failed to create the maps for TVX:FCHBA Self Test ,Check the memory "
-                        "availablity"),
-              TVX_ERR);
-  }
-}
-
-// --- Instances that a map refuses
-
-/// A map of the feature, the entry in it that belongs to the second test, and what is told when it
-/// is there already.
-struct Refusal {
-  Instance_Map_Base& (*map)(Agent_Maps& maps);
-  std::size_t entry;
-  const char* text;
-};
-
-template <auto MAP>
-Instance_Map_Base& mapOf(Agent_Maps& maps) {
-  return maps.*MAP;
-}
-
-using A = Agent_Maps;
-const Refusal REFUSALS[] = {
-    {mapOf<&A::m_TVXHBA_FCHBADiagnosticTest_map>, 1,
-     "Insert Failed : TVXHBA_FCHBADiagnosticTest_map"},
-    {mapOf<&A::m_TVXHBA_HelpService_map>, 1, "Insert Failed : TVXHBA_HelpService_map"},
-    {mapOf<&A::m_TVXHBA_ServiceAvailableToElement_map>, 1,
-     "Insert Failed : TVXHBA_ServiceAvailableToElement_map"},
-    {mapOf<&A::m_TVXHBA_DiagnosticIdentity_map>, 1,
-     "Insert Failed : TVXHBA_DiagnosticIdentity_map"},
-    {mapOf<&A::m_TVXHBA_DiagElementSoftwareIdentity_map>, 1,
-     "Insert Failed : TVXHBA_DiagElementSoftwareIdentity_map"},
-    {mapOf<&A::m_TVXHBA_FCHBADiagnosticSettingData_map>, 1,
-     "Insert Failed : TVXHBA_FCHBADiagnosticSettingData_map"},
-    {mapOf<&A::m_TVXHBA_DiagElementSettingData_map>, 1,
-     "Insert Failed : TVXHBA_DiagElementSettingData"},
-    {mapOf<&A::m_TVXHBA_FCHBADiagnosticServiceCapabilities_map>, 1,
-     "Insert Failed : TVXHBA_FCHBADiagnosticServiceCapabilities_map"},
-    {mapOf<&A::m_TVXHBA_DiagElementCapabilities_map>, 1,
-     "Insert Failed : TVXHBA_FCHBAElementCapabilities_map"},
-    {mapOf<&A::m_TVXHBA_JobElementSettingData_map>, 1,
-     "Insert Failed : TVXHBA_JobElementSettingData"},
-    {mapOf<&A::m_TVXHBA_DiagnosticsLog_map>, 1, "Insert Failed : DiagnosticsLog_map"},
-    {mapOf<&A::m_TVXHBA_UseOfLog_map>, 1, "Insert Failed : UseOfLog_map"},
-    {mapOf<&A::m_TVXHBA_AvailableDiagnosticService_map>, 2,
-     "Insert Failed : TVXHBA_AvailableDiagnosticService_map"},
-    {mapOf<&A::m_TVXHBA_ServiceAffectsElement_map>, 2,
-     "Insert Failed : TVXHBA_ServiceAffectsElement_map"},
-};
-
-TEST_F(Class_Feature, ATestThatAMapRefusesIsLeftOutAndTheOthersAreOffered) {
-  build();
-  TVX_Diagnostics diagnostics(*agent);
-  const std::string gaveUp =
-      "Failed to insert the Diag Instances into map for DiagTest TVX:FCHBA Echo Test";
-  for (const Refusal& row : REFUSALS) {
-    Instance_Map_Base& map = row.map(*agent);
-    Ref<Instance> inTheWay(clone(static_cast<const Instance*>(map.at(row.entry))));
-    diagnostics.ClearDiagnosticClassMaps(0);
-    ASSERT_EQ(map.insert(inTheWay.release()), 0u);
-    log.clear();
-    EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0) << row.text;
-    EXPECT_EQ(log.only({row.text, gaveUp}), (Texts{row.text, gaveUp}));
-    EXPECT_EQ(log.level(row.text), TVX_DBG) << row.text;
-    EXPECT_EQ(log.level(gaveUp), TVX_ERR);
-    const bool ownInTheWay = &map == &agent->m_TVXHBA_FCHBADiagnosticTest_map;
-    EXPECT_EQ(test(ECHO_TEST) != nullptr, ownInTheWay) << row.text;
-    EXPECT_EQ(agent->m_TVXHBA_FCHBADiagnosticTest_map.size(), COUNT - (ownInTheWay ? 0 : 1));
-    diagnostics.ClearDiagnosticClassMaps(0);
-    EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0);
-  }
-}
-
-TEST_F(Class_Feature, WhatARoundBroughtBeforeItsFailureStays) {
-  build();
-  TVX_Diagnostics diagnostics(*agent);
-  Ref<TVXHBA_UseOfLog> inTheWay(clone(agent->m_TVXHBA_UseOfLog_map[1]));
-  diagnostics.ClearDiagnosticClassMaps(0);
-  agent->m_TVXHBA_UseOfLog_map.insert(inTheWay.release());
-  diagnostics.CreateFCHBADiagnosticClassFeature();
-  EXPECT_EQ(agent->m_TVXHBA_HelpService_map.size(), COUNT);
-  EXPECT_EQ(agent->m_TVXHBA_FCHBADiagnosticSettingData_map.size(), COUNT);
-  EXPECT_EQ(agent->m_TVXHBA_DiagnosticsLog_map.size(), COUNT);
-  EXPECT_EQ(agent->m_TVXHBA_AvailableDiagnosticService_map.size(), 2 * (COUNT - 1));
-}
-
-TEST_F(Class_Feature, JobSettingsAreInsertedOnlyIntoAnEmptyMap) {
-  build();
-  TVX_Diagnostics diagnostics(*agent);
-  Ref<TVXHBA_JobSettingData> other = givenForJobs();
-  other->ElementName.set("there before");
-  diagnostics.ClearDiagnosticClassMaps(0);
-  agent->m_TVXHBA_JobSettingData_map.insert(other.release());
-  EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0);
-  ASSERT_EQ(agent->m_TVXHBA_JobSettingData_map.size(), 1u);
-  EXPECT_EQ(textOf(agent->m_TVXHBA_JobSettingData_map[0]->ElementName), "there before");
-  EXPECT_EQ(agent->m_TVXHBA_FCHBADiagnosticTest_map.size(), COUNT);
-}
-
-TEST_F(Class_Feature, LinksThatExistAreToldAndTheRestStands) {
-  build();
-  TVX_Diagnostics diagnostics(*agent);
-  EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0);
-  for (const char* text : {"Insert failed : TVXHBA_ServiceConformsToProfile_map",
-                           "Insert failed : TVXHBA_DiagHostedService_map",
-                           "Insert failed : TVXHBA_HostedService_map"}) {
-    EXPECT_EQ(log.count(text), COUNT) << text;
-    EXPECT_EQ(log.level(text), TVX_CRIT) << text;
-  }
-  EXPECT_EQ(agent->m_TVXHBA_DiagHostedService_map.size(), COUNT);
-}
-
-TEST_F(Class_Feature, MissingProfileIsTold) {
-  build();
-  TVX_Diagnostics diagnostics(*agent);
-  agent->m_TVXHBA_RegisteredProfile_map.clear();
-  diagnostics.ClearDiagnosticClassMaps(0);
-  EXPECT_EQ(diagnostics.CreateFCHBADiagnosticClassFeature(), 0);
-  EXPECT_EQ(log.level("FCHBA Registration Profile instance missing"), TVX_DBG);
-  EXPECT_EQ(agent->m_TVXHBA_DiagServiceConformsToProfile_map.size(), 0u);
-  EXPECT_EQ(agent->m_TVXHBA_DiagHostedService_map.size(), COUNT);
+  std::uint32_t version = 99;
+  EXPECT_EQ(TVX_Diagnostics::GetDiagnosticVersion(FIRST_PORT, &version), 0);
+  EXPECT_EQ(told, 2048u);
+  EXPECT_EQ(version, 99u) << "unchanged";
+  taken() = {};
+  addFault(R"({"call": "LRM_GetHBAAttributes", "omit_attributes": ["diag_version"]})");
+  EXPECT_EQ(TVX_Diagnostics::GetDiagnosticVersion(FIRST_PORT, &version), 0);
+  EXPECT_EQ(version, 99u) << "an adapter that doesn't tell it";
 }
 
 // --- Scopes
@@ -625,11 +519,7 @@ TEST_F(Class_Feature, ScopesClearTheirMapsAndNoOthers) {
   EXPECT_EQ(jobs(), 3u);
   EXPECT_EQ(records(), 3u + 3u + 1u + 1u + 2u + 1u);
   EXPECT_EQ(diagnostics.ClearDiagnosticClassMaps(0), 0);
-  for (const Refusal& row : REFUSALS) EXPECT_EQ(row.map(*agent).size(), 0u) << row.text;
-  EXPECT_EQ(agent->m_TVXHBA_JobSettingData_map.size(), 0u);
-  EXPECT_EQ(agent->m_TVXHBA_DiagHostedService_map.size(), 0u);
-  EXPECT_EQ(agent->m_TVXHBA_HostedService_map.size(), 0u);
-  EXPECT_EQ(agent->m_TVXHBA_DiagServiceConformsToProfile_map.size(), 0u);
+  EXPECT_EQ(featureInstances(*agent), 0u);
   EXPECT_EQ(jobs(), 3u);
   EXPECT_EQ(records(), 11u);
   EXPECT_EQ(diagnostics.ClearDiagnosticClassMaps(1), 0);

@@ -1,5 +1,7 @@
 // The two small methods: help on a test, and clearing its log.
 #include "Diagnostics_Fixture.h"
+#include "Refused_Calls.h"
+#include "runtime/Typed_Instance.h"
 
 namespace cimrt::test {
 namespace {
@@ -50,6 +52,15 @@ TEST_F(Get_Help, ReadsNamesWithoutRegardToCase) {
   EXPECT_EQ(ask().result, 0);
 }
 
+TEST_F(Get_Help, OfTheFirstServiceWithThatNameInAnyCase) {
+  service->Name.set("TVX:FCHBA ping test");
+  service->DocumentsAvailable.set({"another"});
+  agent->m_TVXHBA_HelpService_map.insert(clone(service.get()));
+  const Help help = ask();
+  EXPECT_EQ(help.result, 0);
+  EXPECT_EQ(help.text, "Test verifies the existence and accessibility of devices on the SAN");
+}
+
 TEST_F(Get_Help, WithoutADescriptionIsEmpty) {
   entryOf(agent->m_TVXHBA_HelpService_map, &TVXHBA_HelpService::Name, PING_TEST)
       ->DocumentDescriptions.set(std::initializer_list<String>{});
@@ -64,6 +75,8 @@ TEST_F(Get_Help, DocumentsOfOtherServicesAreNotItsOwn) {
   document.set("no such document");
   EXPECT_EQ(ask().result, 4);
   EXPECT_EQ(ask().text, "(null)");
+  delivery.set(2);
+  EXPECT_EQ(ask().result, 4) << "the document is looked for first";
 }
 
 TEST_F(Get_Help, OnlyTextIsDelivered) {
@@ -140,14 +153,19 @@ TEST_F(Clear_Log, TakesTheResultsOfItsTestAndLeavesTheOthersInOrder) {
   ASSERT_EQ(services_.size(), 5u);
   const std::size_t settingRecords = agent->m_TVXHBA_DiagnosticSettingDataRecord_map.size();
   const std::size_t corresponding = agent->m_TVXHBA_CorrespondingSettingDataRecord_map.size();
-  Texts kept = ids(completions);
-  kept.erase(kept.begin() + 3);
-  kept.erase(kept.begin() + 1);
+  const auto withoutPing = [](Texts all) {
+    all.erase(all.begin() + 3);
+    all.erase(all.begin() + 1);
+    return all;
+  };
+  const Texts kept = withoutPing(ids(completions));
+  const Texts keptServices = withoutPing(ids(services_));
   EXPECT_EQ(clear(PING_TEST), 0);
   const Texts left = {STATUS_TEST, HOST_LOOPBACK_TEST, STATUS_TEST};
   EXPECT_EQ(services(services_), left);
   EXPECT_EQ(services(completions), left);
   EXPECT_EQ(ids(completions), kept) << "the very same, in their order";
+  EXPECT_EQ(ids(services_), keptServices);
   EXPECT_EQ(agent->m_TVXHBA_LogManagesRecord_map.size(), 6u);
   EXPECT_EQ(agent->m_TVXHBA_RecordAppliesToElement_map.size(), 6u);
   EXPECT_EQ(agent->m_TVXHBA_DiagnosticSettingDataRecord_map.size(), settingRecords);
@@ -157,19 +175,65 @@ TEST_F(Clear_Log, TakesTheResultsOfItsTestAndLeavesTheOthersInOrder) {
                       "Exiting TVXHBA_DiagnosticsLog_Provider::ClearLog"}),
             (Texts{"Exiting the TVXHBA CDM Clear log",
                    "Exiting TVXHBA_DiagnosticsLog_Provider::ClearLog"}));
+  EXPECT_EQ(log.level("Exiting the TVXHBA CDM Clear log"), TVX_DBG);
+}
+
+TEST_F(Clear_Log, GoesThroughItsFourMapsTwiceBackwards) {
+  run(STATUS_TEST);
+  run(RESET_TEST);
+  const std::string statusID =
+      textOf(agent->m_TVXHBA_DiagnosticCompletionRecord_map[0]->InstanceID);
+  run(STATUS_TEST);
+  Texts inserted;
+  const Refused_Calls watch({}, [&](const Instance& instance) {
+    const auto* record = typed<TVXHBA_DiagnosticCompletionRecord>(&instance);
+    const bool first = record && textOf(record->InstanceID) == statusID;
+    inserted.push_back(instance.meta_class->name + std::string(first ? " 1" : ""));
+    return false;
+  });
+  EXPECT_EQ(clear(RESET_TEST), 0);
+  Texts expected(8, "TVXHBA_LogManagesRecord");
+  expected.insert(expected.end(), 8, "TVXHBA_RecordAppliesToElement");
+  const std::string record = "TVXHBA_DiagnosticCompletionRecord";
+  expected.insert(expected.end(), {record, record + " 1", record + " 1", record});
+  expected.insert(expected.end(), 4, "TVXHBA_DiagnosticServiceRecord");
+  EXPECT_EQ(inserted, expected);
 }
 
 TEST_F(Clear_Log, LeavesTheTiesOfTheOthersInOrder) {
   run(STATUS_TEST);
   run(RESET_TEST);
   run(STATUS_TEST, nullptr, nullptr, PLUGGED_PORT);
-  auto& map = agent->m_TVXHBA_RecordAppliesToElement_map;
+  auto& applies = agent->m_TVXHBA_RecordAppliesToElement_map;
+  auto& manages = agent->m_TVXHBA_LogManagesRecord_map;
   std::vector<Ref<Instance>> before;
-  for (const std::size_t i : {0u, 1u, 4u, 5u})
-    before.emplace_back(clone(static_cast<const Instance*>(map[i])));
+  for (const std::size_t i : {0u, 1u, 4u, 5u}) {
+    before.emplace_back(clone(static_cast<const Instance*>(applies[i])));
+    before.emplace_back(clone(static_cast<const Instance*>(manages[i])));
+  }
   EXPECT_EQ(clear(RESET_TEST), 0);
-  ASSERT_EQ(map.size(), before.size());
-  for (std::size_t i = 0; i < before.size(); i++) EXPECT_TRUE(identical(map[i], before[i].get()));
+  ASSERT_EQ(applies.size(), 4u);
+  ASSERT_EQ(manages.size(), 4u);
+  for (std::size_t i = 0; i < 4; i++) {
+    EXPECT_TRUE(identical(applies[i], before[2 * i].get()));
+    EXPECT_TRUE(identical(manages[i], before[2 * i + 1].get()));
+  }
+}
+
+TEST_F(Clear_Log, RecordsAddUpUntilTheirLogIsCleared) {
+  TVXHBA_DiagnosticsLog& data =
+      *entryOf(agent->m_TVXHBA_DiagnosticsLog_map, &TVXHBA_DiagnosticsLog::InstanceID, STATUS_TEST);
+  TVX_Diagnostics diagnostics(*agent);
+  constexpr std::size_t MORE_THAN_ITS_MAXIMUM = 201;
+  for (std::size_t i = 0; i < MORE_THAN_ITS_MAXIMUM; i++)
+    diagnostics.CreateDiagnosticServiceRecord(
+        {STATUS_TEST, "done", std::to_string(i), nullptr, COMPLETION_OK, controller(), false});
+  EXPECT_EQ(agent->m_TVXHBA_DiagnosticServiceRecord_map.size(), MORE_THAN_ITS_MAXIMUM);
+  EXPECT_EQ(numberOf(data.MaxNumberOfRecords), 200);
+  EXPECT_EQ(numberOf(data.CurrentNumberOfRecords), 0);
+  EXPECT_EQ(clear(STATUS_TEST), 0);
+  EXPECT_EQ(agent->m_TVXHBA_DiagnosticServiceRecord_map.size(), 0u);
+  EXPECT_EQ(numberOf(data.CurrentNumberOfRecords), 0);
 }
 
 TEST_F(Clear_Log, UnknownLogIsRefused) {

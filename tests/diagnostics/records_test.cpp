@@ -1,5 +1,9 @@
 // What a run leaves behind: its job, its records, and what ties them to the rest.
+#include <set>
+
 #include "Diagnostics_Fixture.h"
+#include "Refused_Calls.h"
+#include "common/TVX_Clock.h"
 
 namespace cimrt::test {
 namespace {
@@ -17,6 +21,12 @@ constexpr const char* VERIFY_SAN =
     "Suggested Actions a) Verify end devices b) Verify switch configuration c) Verify and replace "
     "cable(s) if faultyd) Verify and replace transceiver(s) if faulty e) Replace Card f) Replace "
     "Switch";
+
+/// What both records of a test that counts cycles tell.
+const std::set<std::string> RESULT_PROPERTIES = {
+    "InstanceID",  "Description",   "ElementName",        "RecordType",        "ServiceName",
+    "RecordData",  "RecordFormat",  "ManagedElementName", "CreationTimeStamp", "LoopsFailed",
+    "LoopsPassed", "TimeToExecute", "CompletedCycles"};
 
 const Meta_Class* unmakeable = nullptr;
 Instance* makeAllButOne(const Meta_Class* metaClass) {
@@ -40,120 +50,9 @@ class Records : public Diagnostics_Test {
   TVXHBA_DiagnosticsLog* logOf(const char* name) {
     return entryOf(agent->m_TVXHBA_DiagnosticsLog_map, &TVXHBA_DiagnosticsLog::InstanceID, name);
   }
-  TVXHBA_ConcreteJob* makeJob(std::uint32_t state, bool deleteOnCompletion = false) {
-    Property<bool> flag{deleteOnCompletion, 0};
-    return TVX_Diagnostics(*agent).CreateConcreteJobInstantiateNonBlocking(SELF_TEST, flag, state,
-                                                                           9, controller());
-  }
-  /// The number in the name of a job.
-  static int numberIn(const std::string& id) {
-    const std::string head = std::string(SELF_TEST) + ":";
-    EXPECT_EQ(id.substr(0, head.size()), head);
-    return std::stoi(id.substr(head.size()));
-  }
 
   RM_DiagResult result{};
 };
-
-// --- Jobs
-
-TEST_F(Records, JobTellsHowItsTestEnded) {
-  const TVXHBA_ConcreteJob& good = *makeJob(7);
-  EXPECT_EQ(textOf(good.InstanceID), std::string(SELF_TEST) + ":" +
-                                         std::to_string(numberIn(textOf(good.InstanceID))) + ":9");
-  EXPECT_EQ(textOf(good.ElementName), "TVXHBA_ConcreteJob");
-  EXPECT_EQ(textOf(good.Name), SELF_TEST);
-  EXPECT_EQ(numberOf(good.DeleteOnCompletion), 0);
-  EXPECT_EQ(numberOf(good.JobState), 7);
-  EXPECT_EQ(numberOf(good.PercentComplete), 100);
-  ASSERT_FALSE(good.TimeSubmitted.is_null());
-  EXPECT_TRUE(good.TimeSubmitted.value.is_timestamp());
-  EXPECT_TRUE(good.ElapsedTime.value.equal(good.TimeSubmitted.value));
-  EXPECT_TRUE(good.diagHandle.is_null());
-  EXPECT_TRUE(good.wwpn.is_null());
-  EXPECT_TRUE(good.ErrorCode.is_null());
-  EXPECT_TRUE(good.__name_space == "root/torvex");
-  const TVXHBA_ConcreteJob& bad = *makeJob(0x8000);
-  EXPECT_EQ(numberOf(bad.JobState), 10);
-  EXPECT_EQ(numberOf(bad.PercentComplete), 0);
-  EXPECT_EQ(log.count("CreateConcreteJobInstantiateNonBlocking"), 2u);
-}
-
-TEST_F(Records, JobsAreNumbered) {
-  const int first = numberIn(textOf(makeJob(7)->InstanceID));
-  EXPECT_EQ(numberIn(textOf(makeJob(7)->InstanceID)), first + 1);
-}
-
-TEST_F(Records, JobIsTiedToItsTestAndToItsPort) {
-  const TVXHBA_ConcreteJob* job = makeJob(7);
-  ASSERT_EQ(agent->m_TVXHBA_OwningJobElement_map.size(), 1u);
-  EXPECT_TRUE(tiesClones(agent->m_TVXHBA_OwningJobElement_map[0], test(SELF_TEST), job));
-  ASSERT_EQ(agent->m_TVXHBA_AffectedJobElement_map.size(), 1u);
-  EXPECT_TRUE(tiesClones(agent->m_TVXHBA_AffectedJobElement_map[0], controller(), job));
-}
-
-TEST_F(Records, JobsOfTestsWithoutIdentifierSayFFFF) {
-  for (const char* name : {STATUS_TEST, RESET_TEST, BEACON_TEST}) {
-    const std::string id = textOf(run(name).job->InstanceID);
-    EXPECT_EQ(id.substr(id.rfind(':')), ":65535") << name;
-  }
-  const std::string id = textOf(run(SELF_TEST).job->InstanceID);
-  EXPECT_EQ(id.substr(id.rfind(':')), ":1");
-}
-
-TEST_F(Records, JobsThatCantBeMadeOrInsertedAreTold) {
-  setDiagnosticFactory(makeAllButOne);
-  unmakeable = &TVXHBA_ConcreteJob::static_meta_class;
-  EXPECT_EQ(makeJob(7), nullptr);
-  EXPECT_EQ(log.level("Unable to create TVXHBA_ConcreteJob"), TVX_ERR);
-  unmakeable = nullptr;
-  const int number = numberIn(textOf(makeJob(7)->InstanceID));
-  Ref<TVXHBA_ConcreteJob> inTheWay(clone(agent->m_TVXHBA_ConcreteJob_map[0]));
-  inTheWay->InstanceID.set(
-      (std::string(SELF_TEST) + ":" + std::to_string(number + 1) + ":9").c_str());
-  agent->m_TVXHBA_ConcreteJob_map.insert(inTheWay.release());
-  EXPECT_EQ(makeJob(7), nullptr);
-  EXPECT_EQ(log.level("Insert Failed: TVXHBA_ConcreteJob"), TVX_CRIT);
-}
-
-TEST_F(Records, TiesOfAJobThatFailAreToldAndTheJobStands) {
-  setDiagnosticFactory(makeAllButOne);
-  for (const Meta_Class* part : {&TVXHBA_OwningJobElement::static_meta_class,
-                                 &TVXHBA_AffectedJobElement::static_meta_class}) {
-    unmakeable = part;
-    EXPECT_NE(makeJob(7), nullptr);
-    EXPECT_EQ(log.level(std::string("Unable to create ") + part->name), TVX_ERR);
-  }
-  unmakeable = nullptr;
-  // A job that went and comes again under its name meets its own ties.
-  const TVXHBA_ConcreteJob* job = makeJob(7);
-  const int number = numberIn(textOf(job->InstanceID));
-  agent->m_TVXHBA_OwningJobElement_map.clear();
-  agent->m_TVXHBA_AffectedJobElement_map.clear();
-  Ref<TVXHBA_ConcreteJob> next(clone(job));
-  next->InstanceID.set((std::string(SELF_TEST) + ":" + std::to_string(number + 1) + ":9").c_str());
-  agent->m_TVXHBA_OwningJobElement_map.insert(
-      makeAssociation<TVXHBA_OwningJobElement>(test(SELF_TEST), next.get()).release());
-  agent->m_TVXHBA_AffectedJobElement_map.insert(
-      makeAssociation<TVXHBA_AffectedJobElement>(controller(), next.get()).release());
-  EXPECT_NE(makeJob(7), nullptr);
-  for (const char* text :
-       {"Insert Failed: TVXHBA_OwningJobElement", "Insert Failed: TVXHBA_AffectedJobElement"})
-    EXPECT_EQ(log.level(text), TVX_ERR);
-}
-
-TEST_F(Records, DeletedJobLeavesItsTies) {
-  TVX_Diagnostics diagnostics(*agent);
-  EXPECT_EQ(diagnostics.DeleteConcreteJob(nullptr), 0x80C9);
-  EXPECT_EQ(log.level("Invalid Job ID"), TVX_DBG);
-  const TVXHBA_ConcreteJob* job = makeJob(7);
-  makeJob(7);
-  EXPECT_EQ(diagnostics.DeleteConcreteJob(job), 0);
-  EXPECT_EQ(agent->m_TVXHBA_ConcreteJob_map.size(), 1u);
-  EXPECT_EQ(agent->m_TVXHBA_OwningJobElement_map.size(), 2u);
-  EXPECT_EQ(agent->m_TVXHBA_AffectedJobElement_map.size(), 2u);
-  EXPECT_EQ(log.count("TVXHBA_DiagTestFunc::DeleteConcreteJob()"), 2u);
-}
 
 // --- Records
 
@@ -166,12 +65,13 @@ TEST_F(Records, ServiceRecordHoldsTheResult) {
   EXPECT_EQ(numberOf(record.RecordType), 2);
   EXPECT_EQ(textOf(record.ServiceName), PING_TEST);
   EXPECT_EQ(textOf(record.ManagedElementName), textOf(controller()->ElementName));
-  EXPECT_TRUE(record.CreationTimeStamp.value.is_timestamp());
+  EXPECT_TRUE(record.CreationTimeStamp.value.equal(tvxNowDatetime()));
   EXPECT_EQ(textOf(record.RecordData), "the text") << "no suggested action here";
   EXPECT_EQ(textOf(record.RecordFormat), "");
   EXPECT_EQ(log.level("CreateDiagnosticServiceRecord"), TVX_DBG);
   EXPECT_EQ(log.level("PortController : 10000000000000A1"), TVX_DBG);
   EXPECT_TRUE(record.__name_space == "root/torvex");
+  EXPECT_EQ(filledIn(&record), RESULT_PROPERTIES);
 }
 
 TEST_F(Records, CompletionRecordHoldsTheResultAndItsState) {
@@ -183,11 +83,16 @@ TEST_F(Records, CompletionRecordHoldsTheResultAndItsState) {
   EXPECT_EQ(numberOf(record.RecordType), 2);
   EXPECT_EQ(textOf(record.ServiceName), PING_TEST);
   EXPECT_EQ(textOf(record.ManagedElementName), textOf(controller()->ElementName));
-  EXPECT_TRUE(record.CreationTimeStamp.value.is_timestamp());
+  EXPECT_TRUE(record.CreationTimeStamp.value.equal(tvxNowDatetime()));
   EXPECT_EQ(textOf(record.RecordData), "the text");
   EXPECT_EQ(textOf(record.RecordFormat), "");
   EXPECT_EQ(numberOf(record.CompletionState), 2);
   EXPECT_EQ(log.level("CreateDiagnosticCompletionRecord"), TVX_DBG);
+  EXPECT_EQ(log.level("PortController : 10000000000000A1"), TVX_DBG);
+  EXPECT_TRUE(record.__name_space == "root/torvex");
+  std::set<std::string> properties = RESULT_PROPERTIES;
+  properties.insert("CompletionState");
+  EXPECT_EQ(filledIn(&record), properties);
 }
 
 TEST_F(Records, CountsComeFromTestsThatHaveThem) {
@@ -257,6 +162,12 @@ TEST_F(Records, LongTextsAreCut) {
   longOne.text = std::string(2000, 'x');
   TVX_Diagnostics(*agent).CreateDiagnosticCompletionRecord(longOne);
   EXPECT_EQ(textOf(lastCompletionRecord().RecordData), std::string(1023, 'x'));
+  longOne.jobID = "another";
+  longOne.text = std::string(1000, 'y');
+  longOne.completionState = COMPLETION_FAILED;
+  TVX_Diagnostics(*agent).CreateDiagnosticCompletionRecord(longOne);
+  EXPECT_EQ(textOf(lastCompletionRecord().RecordData),
+            std::string(1000, 'y') + (std::string(" : ") + REPLACE_CARD).substr(0, 23));
 }
 
 TEST_F(Records, RecordsAreTiedToTheirLogAndTheirPort) {
@@ -288,8 +199,12 @@ TEST_F(Records, SettingsOfARunHaveARecordOfTheirOwn) {
   EXPECT_EQ(textOf(record.ElementName), std::string(PING_TEST) + " SettingData Record");
   EXPECT_EQ(textOf(record.ServiceName), PING_TEST);
   EXPECT_EQ(textOf(record.ManagedElementName), textOf(controller()->ElementName));
-  EXPECT_TRUE(record.CreationTimeStamp.value.is_timestamp());
+  EXPECT_TRUE(record.CreationTimeStamp.value.equal(tvxNowDatetime()));
   EXPECT_EQ(record.Settings, nullptr) << "the request puts them in";
+  EXPECT_TRUE(record.__name_space == "root/torvex");
+  EXPECT_EQ(filledIn(&record),
+            (std::set<std::string>{"InstanceID", "Caption", "Description", "ElementName",
+                                   "ServiceName", "ManagedElementName", "CreationTimeStamp"}));
   auto& corresponding = agent->m_TVXHBA_CorrespondingSettingDataRecord_map;
   ASSERT_EQ(corresponding.size(), 2u);
   EXPECT_TRUE(tiesClones(corresponding[0], &lastServiceRecord(), &record));
@@ -298,6 +213,39 @@ TEST_F(Records, SettingsOfARunHaveARecordOfTheirOwn) {
   EXPECT_TRUE(tiesClones(agent->m_TVXHBA_LogManagesRecord_map[1], logOf(PING_TEST), &record));
   ASSERT_EQ(agent->m_TVXHBA_RecordAppliesToElement_map.size(), 3u);
   EXPECT_TRUE(tiesClones(agent->m_TVXHBA_RecordAppliesToElement_map[1], &record, controller()));
+}
+
+TEST_F(Records, WithoutAManagedElementTheyAreTheAdapters) {
+  TVX_Diagnostics diagnostics(*agent);
+  Diagnostic_Outcome none = outcome(PING_TEST, false, true);
+  none.element = nullptr;
+  diagnostics.CreateDiagnosticServiceRecord(none);
+  diagnostics.CreateDiagnosticCompletionRecord(none);
+  EXPECT_EQ(log.count("Invalid managed element"), 2u);
+  EXPECT_EQ(log.level("Invalid managed element"), TVX_DBG);
+  EXPECT_EQ(textOf(lastServiceRecord().ManagedElementName), "TVXHBA_Adapter");
+  EXPECT_EQ(textOf(lastCompletionRecord().ManagedElementName), "TVXHBA_Adapter");
+  EXPECT_EQ(textOf(agent->m_TVXHBA_DiagnosticSettingDataRecord_map[0]->ManagedElementName),
+            "TVXHBA_Adapter");
+  EXPECT_EQ(agent->m_TVXHBA_LogManagesRecord_map.size(), 3u);
+  EXPECT_EQ(agent->m_TVXHBA_RecordAppliesToElement_map.size(), 0u);
+}
+
+TEST_F(Records, ComeInTheirOrder) {
+  Texts came;
+  const Refused_Calls watch({}, [&](const Instance& instance) {
+    came.emplace_back(instance.meta_class->name);
+    return false;
+  });
+  ASSERT_EQ(run(HOST_LOOPBACK_TEST, givenFor(HOST_LOOPBACK_TEST).get()).result, 0);
+  EXPECT_EQ(came,
+            (Texts{"TVXHBA_ConcreteJob", "TVXHBA_OwningJobElement", "TVXHBA_AffectedJobElement",
+                   "TVXHBA_DiagnosticServiceRecord", "TVXHBA_LogManagesRecord",
+                   "TVXHBA_DiagnosticSettingDataRecord", "TVXHBA_CorrespondingSettingDataRecord",
+                   "TVXHBA_LogManagesRecord", "TVXHBA_RecordAppliesToElement",
+                   "TVXHBA_RecordAppliesToElement", "TVXHBA_DiagnosticCompletionRecord",
+                   "TVXHBA_LogManagesRecord", "TVXHBA_CorrespondingSettingDataRecord",
+                   "TVXHBA_RecordAppliesToElement"}));
 }
 
 // --- Failures. Each ends its function; what was inserted by then stays.
@@ -345,6 +293,59 @@ TEST_F(Records, RecordsAndTiesThatCantBeMadeAreTold) {
     EXPECT_EQ(log.level(row.text), TVX_DBG) << row.text;
     EXPECT_EQ(agent->m_TVXHBA_LogManagesRecord_map.size(), row.managed) << row.text;
     EXPECT_EQ(agent->m_TVXHBA_RecordAppliesToElement_map.size(), row.applies) << row.text;
+  }
+}
+
+/// Makes the first instance of a class and no more.
+std::size_t leftToMake = 0;
+Instance* makeOnlyOne(const Meta_Class* metaClass) {
+  if (metaClass == unmakeable && leftToMake-- == 0) return nullptr;
+  return create(metaClass, true);
+}
+
+TEST_F(Records, SecondTiesThatCantBeMadeAreTold) {
+  const struct {
+    const Meta_Class* part;
+    const char* text;
+    std::size_t applies;
+  } rows[] = {
+      {&TVXHBA_LogManagesRecord::static_meta_class, "Failed to create TVXHBA_LogManagesRecord", 0},
+      {&TVXHBA_RecordAppliesToElement::static_meta_class,
+       "Failed to create TVXHBA_RecordAppliesToElement", 1}};
+  TVX_Diagnostics diagnostics(*agent);
+  setDiagnosticFactory(makeOnlyOne);
+  for (const auto& row : rows) {
+    diagnostics.ClearDiagnosticClassMaps(1);
+    log.clear();
+    unmakeable = row.part;
+    leftToMake = 1;
+    diagnostics.CreateDiagnosticServiceRecord(outcome(PING_TEST, false, true));
+    EXPECT_EQ(log.level(row.text), TVX_DBG) << row.text;
+    EXPECT_EQ(agent->m_TVXHBA_DiagnosticSettingDataRecord_map.size(), 1u) << "it stays";
+    EXPECT_EQ(agent->m_TVXHBA_CorrespondingSettingDataRecord_map.size(), 1u);
+    EXPECT_EQ(agent->m_TVXHBA_RecordAppliesToElement_map.size(), row.applies) << row.text;
+  }
+}
+
+TEST_F(Records, SecondTiesThatAreRefusedAreTold) {
+  const struct {
+    const Meta_Class* part;
+    const char* text;
+  } rows[] = {
+      {&TVXHBA_LogManagesRecord::static_meta_class, "Insert Failed : TVXHBA_LogManagesRecord"},
+      {&TVXHBA_RecordAppliesToElement::static_meta_class,
+       "Insert Failed : RecordAppliesToElement"}};
+  TVX_Diagnostics diagnostics(*agent);
+  for (const auto& row : rows) {
+    diagnostics.ClearDiagnosticClassMaps(1);
+    log.clear();
+    std::size_t seen = 0;
+    const Refused_Calls refused({}, [&](const Instance& instance) {
+      return instance.meta_class == row.part && ++seen == 2;
+    });
+    diagnostics.CreateDiagnosticServiceRecord(outcome(PING_TEST, false, true));
+    EXPECT_EQ(log.count(row.text), 1u);
+    EXPECT_EQ(log.level(row.text), TVX_DBG) << row.text;
   }
 }
 
@@ -428,6 +429,18 @@ TEST_F(Records, TwoRunsOfOneTestKeepTwoSetsOfRecords) {
   EXPECT_EQ(textOf(lastCompletionRecord().InstanceID), textOf(second.job->InstanceID));
   EXPECT_EQ(textOf(lastServiceRecord().InstanceID),
             textOf(second.job->InstanceID) + ":Service Record");
+}
+
+TEST_F(Records, ResultsGoWithTheProvider) {
+  run(HOST_LOOPBACK_TEST, givenFor(HOST_LOOPBACK_TEST).get());
+  ASSERT_EQ(agent->m_TVXHBA_ConcreteJob_map.size(), 1u);
+  stopAgent();
+  agent = nullptr;
+  build();
+  EXPECT_EQ(agent->m_TVXHBA_ConcreteJob_map.size(), 0u);
+  EXPECT_EQ(agent->m_TVXHBA_DiagnosticServiceRecord_map.size(), 0u);
+  EXPECT_EQ(agent->m_TVXHBA_DiagnosticCompletionRecord_map.size(), 0u);
+  EXPECT_EQ(agent->m_TVXHBA_DiagnosticSettingDataRecord_map.size(), 0u);
 }
 
 TEST_F(Records, RunTakesTheCountsOfTheLibrary) {

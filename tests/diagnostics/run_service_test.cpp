@@ -1,5 +1,6 @@
 // The request to run a test: its arguments, and what it hands out.
 #include "Diagnostics_Fixture.h"
+#include "Refused_Calls.h"
 
 namespace cimrt::test {
 namespace {
@@ -73,6 +74,43 @@ TEST_F(Run_Service, WantsAPortWithAName) {
   EXPECT_EQ(log.level("TVXHBA_FCHBADiagnosticTest_Provider::str2HBAName failed"), TVX_ERR);
 }
 
+TEST_F(Run_Service, WantsAPortWhoseNameCanBeConverted) {
+  const Ref<TVXHBA_FCHBADiagnosticTest> model(clone(test(SELF_TEST)));
+  const Refused_Calls refused([](const char* id) { return std::string(id) == FIRST_PORT; });
+  EXPECT_EQ(ask(model.get(), controller()), 5);
+  EXPECT_EQ(log.level("TVXHBA_FCHBADiagnosticTest_Provider::Id2HBAName failed"), TVX_ERR);
+  EXPECT_EQ(log.count("Using the default TVXHBA_JobSettingData Instance"), 0u);
+}
+
+TEST_F(Run_Service, APortThatIsNotFoundAgainIsTestedWithoutAManagedElement) {
+  // A key that is null and still holds its digits is the map's own and nobody's DeviceID.
+  TVXHBA_PortController* port = controller();
+  port->DeviceID.null = 1;
+  const Ref<TVXHBA_PortController> element(clone(port));
+  ASSERT_EQ(element->DeviceID.value, FIRST_PORT);
+  const Ref<TVXHBA_FCHBADiagnosticTest> model(clone(test(STATUS_TEST)));
+  TVXHBA_FCHBADiagnosticTest_Provider provider;
+  CIM_ConcreteJob* job = nullptr;
+  Property<std::uint32_t> result{0, 1};
+  Instance* object = element.get();
+  provider.RunDiagnosticService(model.get(), static_cast<const CIM_ManagedElement*>(object),
+                                nullptr, nullptr, job, result);
+  const Ref<Instance> made(job);
+  EXPECT_EQ(numberOf(result), 0);
+  EXPECT_TRUE(made);
+  const Texts steps = {"Device ID 10000000000000A1",
+                       "Could not find the passed PORTController in the map",
+                       "Using the default TVXHBA_JobSettingData Instance"};
+  EXPECT_EQ(log.only(steps), steps);
+  EXPECT_EQ(log.level(steps[1]), TVX_DBG);
+  EXPECT_EQ(log.level("Invalid managed element"), TVX_DBG);
+  EXPECT_EQ(textOf(lastServiceRecord().ManagedElementName), "TVXHBA_Adapter");
+  EXPECT_EQ(textOf(lastCompletionRecord().ManagedElementName), "TVXHBA_Adapter");
+  EXPECT_EQ(agent->m_TVXHBA_RecordAppliesToElement_map.size(), 0u);
+  ASSERT_EQ(agent->m_TVXHBA_AffectedJobElement_map.size(), 1u);
+  EXPECT_EQ(agent->m_TVXHBA_AffectedJobElement_map[0]->AffectedElement, nullptr);
+}
+
 TEST_F(Run_Service, WantsSettings) {
   const char* text = "Unable to get the Job/Diagnostic SettingData, Not able to continue";
   EXPECT_EQ(run(SELF_TEST, givenFor(STATUS_TEST).get()).result, 5);
@@ -83,11 +121,16 @@ TEST_F(Run_Service, WantsSettings) {
   EXPECT_EQ(run(SELF_TEST, nullptr, otherJobs.get()).result, 5);
   EXPECT_EQ(log.level("Invalid input instance: TVXHBA_JobSettingData"), TVX_DBG);
   EXPECT_EQ(log.count(text), 2u);
+  const Texts both = {"Invalid input instance: TVXHBA_JobSettingData", "Entered embedded instance",
+                      "Invalid input instance: TVXHBA_FCHBADiagnosticSettingData", text};
+  log.clear();
+  EXPECT_EQ(run(SELF_TEST, givenFor(STATUS_TEST).get(), otherJobs.get()).result, 5);
+  EXPECT_EQ(log.only(both), both);
   agent->m_TVXHBA_JobSettingData_map.clear();
   EXPECT_EQ(run(SELF_TEST).result, 5);
   agent->m_TVXHBA_FCHBADiagnosticSettingData_map.clear();
   EXPECT_EQ(run(SELF_TEST).result, 5);
-  EXPECT_EQ(log.count(text), 4u);
+  EXPECT_EQ(log.count(text), 3u);
   EXPECT_EQ(log.level(text), TVX_DBG);
   EXPECT_EQ(agent->m_TVXHBA_ConcreteJob_map.size(), 0u);
 }
@@ -105,7 +148,9 @@ TEST_F(Run_Service, EchoAndPingWantATarget) {
     settings(name)->TargetDevice.set("50:06:00:00:00:00:00:B1");
     EXPECT_EQ(run(name).result, 5);
   }
-  EXPECT_EQ(log.count("Invalid TargetDevice, Enter Target WWPN"), 4u);
+  const Texts steps = {std::string("Started Diagnostic : ") + PING_TEST,
+                       "Invalid TargetDevice, Enter Target WWPN"};
+  EXPECT_EQ(log.only(steps), (Texts{steps[1], steps[1], steps[0], steps[1], steps[0], steps[1]}));
   EXPECT_EQ(log.level("Invalid TargetDevice, Enter Target WWPN"), TVX_DBG);
   EXPECT_EQ(agent->m_TVXHBA_ConcreteJob_map.size(), 0u);
 }
@@ -161,6 +206,21 @@ TEST_F(Run_Service, OverridesStayForLaterRuns) {
   EXPECT_EQ(cycles, (std::vector<std::uint32_t>{100, 33, 33, 100}));
 }
 
+TEST_F(Run_Service, SettingsAreRecordedAsLongAsOverridesAreInForce) {
+  const auto settingRecords = [&] {
+    return agent->m_TVXHBA_DiagnosticSettingDataRecord_map.size();
+  };
+  run(HOST_LOOPBACK_TEST);
+  EXPECT_EQ(settingRecords(), 0u) << "nothing was given";
+  run(HOST_LOOPBACK_TEST, givenFor(HOST_LOOPBACK_TEST).get());
+  EXPECT_EQ(settingRecords(), 1u);
+  run(HOST_LOOPBACK_TEST);
+  EXPECT_EQ(settingRecords(), 2u) << "it ran with what was given before";
+  refresh(*agent);
+  run(HOST_LOOPBACK_TEST);
+  EXPECT_EQ(settingRecords(), 2u);
+}
+
 TEST_F(Run_Service, SettingsUsedStandInTheirRecord) {
   Ref<TVXHBA_FCHBADiagnosticSettingData> given = givenFor(HOST_LOOPBACK_TEST);
   given->LoopControlParameter.set({"33"});
@@ -210,6 +270,20 @@ TEST_F(Run_Service, TheBeaconsJobIsHandedOutThoughItIsDeleted) {
   EXPECT_EQ(numberOf(ran.job->DeleteOnCompletion), 1);
   EXPECT_EQ(agent->m_TVXHBA_ConcreteJob_map.size(), 0u);
   EXPECT_EQ(agent->m_TVXHBA_DiagnosticCompletionRecord_map.size(), 1u);
+}
+
+TEST_F(Run_Service, SettingsAreOnlyPutInAlongWithAJob) {
+  Ref<TVXHBA_JobSettingData> jobs = givenForJobs();
+  jobs->DeleteOnCompletion.set(true);
+  auto& settingRecords = agent->m_TVXHBA_DiagnosticSettingDataRecord_map;
+  EXPECT_FALSE(run(HOST_LOOPBACK_TEST, givenFor(HOST_LOOPBACK_TEST).get(), jobs.get()).job);
+  ASSERT_EQ(settingRecords.size(), 1u);
+  EXPECT_EQ(settingRecords[0]->Settings, nullptr);
+  EXPECT_TRUE(run(BEACON_TEST, givenFor(BEACON_TEST).get(), jobs.get()).job);
+  ASSERT_EQ(settingRecords.size(), 2u);
+  const Instance* used = settingRecords[1]->Settings;
+  ASSERT_NE(used, nullptr);
+  EXPECT_TRUE(identical(used, settings(BEACON_TEST)));
 }
 
 TEST_F(Run_Service, NoRecordsAreMadeWithoutAJob) {

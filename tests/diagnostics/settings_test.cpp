@@ -1,5 +1,6 @@
 // What a client may put over the settings of a test, and what stays.
 #include "Diagnostics_Fixture.h"
+#include "Refused_Calls.h"
 
 namespace cimrt::test {
 namespace {
@@ -102,6 +103,7 @@ TEST_F(Settings, PatternIsCutOrPaddedToTheBuffer) {
     setPattern(*given, row.given);
     EXPECT_EQ(pattern(*lay(given)), row.stored);
     EXPECT_EQ(log.count("Valid Pattern entered"), 2u);
+    EXPECT_EQ(log.level("Valid Pattern entered"), TVX_DBG);
     EXPECT_EQ(log.count(BAD_PATTERN), 0u);
   }
 }
@@ -151,6 +153,57 @@ TEST_F(Settings, ChecksRunTwiceInTheirOrder) {
   for (const std::string& text : once) EXPECT_EQ(log.level(text), TVX_DBG);
 }
 
+/// The tests that send a pattern take all of it; no test takes more.
+constexpr const char* SENDING[] = {EXTERNAL_LOOPBACK_TEST, HOST_LOOPBACK_TEST,
+                                   INTERNAL_LOOPBACK_TEST, PING_TEST, ECHO_TEST};
+
+TEST_F(Settings, EachTestThatSendsTakesAllThatIsValid) {
+  for (const char* name : SENDING) {
+    Ref<Given> given = givenFor(name);
+    given->LoopControl.set({3});
+    given->LoopControlParameter.set({"77"});
+    given->HaltOnError.set(true);
+    given->BufferSizes.set({4});
+    setPattern(*given, "cafe");
+    settings(name)->LoopControl.set({2});
+    Given* laid = lay(given);
+    ASSERT_EQ(laid, settings(name));
+    EXPECT_EQ(numbersOf(laid->LoopControl), std::vector<std::uint16_t>{3}) << name;
+    EXPECT_EQ(textsOf(laid->LoopControlParameter), Texts{"77"}) << name;
+    EXPECT_EQ(numberOf(laid->HaltOnError), 1) << name;
+    EXPECT_EQ(numbersOf(laid->BufferSizes), std::vector<std::uint32_t>{4}) << name;
+    EXPECT_EQ(pattern(*laid), "cafe") << name;
+    EXPECT_EQ(numberOf(laid->OverridedSettingData), 1) << name;
+    const Texts once = {"Input LoopControl : 3", "Input LoopControlParam : 77",
+                        "Input Buffer Size : 4", "Valid Pattern entered"};
+    Texts twice = once;
+    twice.insert(twice.end(), once.begin(), once.end());
+    EXPECT_EQ(log.only(once), twice) << name;
+    for (const std::string& text : once) EXPECT_EQ(log.level(text), TVX_DBG) << text;
+    for (const char* text : {BAD_CONTROL, BAD_PARAMETER, BAD_SIZE, BAD_PATTERN})
+      EXPECT_EQ(log.count(text), 0u) << name << text;
+  }
+}
+
+TEST_F(Settings, EachTestThatSendsKeepsItsOwnForAllThatIsNot) {
+  for (const char* name : SENDING) {
+    Ref<Given> given = givenFor(name);
+    given->LoopControl.set({4});
+    given->LoopControlParameter.set({"4001"});
+    given->BufferSizes.set({9});
+    setPattern(*given, "xyz");
+    Given* laid = lay(given);
+    EXPECT_EQ(numbersOf(laid->LoopControl), std::vector<std::uint16_t>{3}) << name;
+    EXPECT_EQ(textsOf(laid->LoopControlParameter), Texts{"100"}) << name;
+    EXPECT_EQ(numberOf(laid->HaltOnError), 0) << name;
+    EXPECT_EQ(numbersOf(laid->BufferSizes), std::vector<std::uint32_t>{8}) << name;
+    EXPECT_EQ(pattern(*laid), "1a2b3c4d") << name;
+    EXPECT_EQ(numberOf(laid->OverridedSettingData), 1) << name;
+    for (const char* text : {BAD_CONTROL, BAD_PARAMETER, BAD_SIZE, BAD_PATTERN})
+      EXPECT_EQ(log.count(text), 2u) << name << text;
+  }
+}
+
 TEST_F(Settings, HaltOnErrorIsTakenAsItIs) {
   Ref<Given> given = givenFor(HOST_LOOPBACK_TEST);
   given->HaltOnError.set(true);
@@ -179,6 +232,8 @@ TEST_F(Settings, TestsWithoutOverridesTellSo) {
     EXPECT_TRUE(laid->LoopControlParameter.is_null());
     EXPECT_EQ(numberOf(laid->HaltOnError), 0);
     EXPECT_EQ(numberOf(laid->OverridedSettingData), 0);
+    laid->OverridedSettingData.set(1);
+    EXPECT_EQ(numberOf(lay(given)->OverridedSettingData), 1) << "left as it is";
   }
 }
 
@@ -188,6 +243,7 @@ TEST_F(Settings, BeaconOnlyNotesThatThereWereSome) {
   Given* laid = lay(given);
   EXPECT_EQ(numberOf(laid->OverridedSettingData), 1);
   EXPECT_EQ(textsOf(laid->LoopControlParameter), Texts{"5"});
+  EXPECT_EQ(log.count("Input LoopControlParam : 9"), 0u);
 }
 
 TEST_F(Settings, EchoAndPingTakeUnitAndTarget) {
@@ -212,6 +268,19 @@ TEST_F(Settings, TargetsOfAnotherLengthLeaveTheOldOne) {
     given->TargetDevice.set(text);
     EXPECT_EQ(textOf(lay(given)->TargetDevice), TARGET) << text;
     EXPECT_EQ(log.count(std::string("Input TargetDevice : ") + text), 1u);
+  }
+}
+
+TEST_F(Settings, TargetThatIsNoNameEmptiesTheOldOne) {
+  const char* text = "getTVXHBA_FCHBADiagnosticSettingDataInstance::Id2HBAName failed";
+  const Refused_Calls refused([](const char* id) { return std::string(id) == TARGET; });
+  for (const char* name : {ECHO_TEST, PING_TEST}) {
+    settings(name)->TargetDevice.set("50060000000000C1");
+    Ref<Given> given = givenFor(name);
+    given->TargetDevice.set(TARGET);
+    EXPECT_EQ(textOf(lay(given)->TargetDevice), "");
+    EXPECT_EQ(log.level(text), TVX_DBG);
+    EXPECT_EQ(numberOf(settings(name)->OverridedSettingData), 1);
   }
 }
 
@@ -251,8 +320,23 @@ TEST_F(Settings, TestsWithoutSettingsHaveNoDefault) {
   EXPECT_EQ(diagnostics.getTVXHBA_FCHBADiagnosticSettingDataInstance(givenFor("no test").get(),
                                                                      "no test"),
             nullptr);
+  EXPECT_EQ(log.level(USING), TVX_DBG) << "there is no name that it could differ from";
   EXPECT_EQ(diagnostics.getDefaultTVXHBA_FCHBADiagnosticSettingDataInstance(SELF_TEST),
             settings(SELF_TEST));
+}
+
+TEST_F(Settings, OverridesOfATestWithoutADefaultGoNowhere) {
+  agent->m_TVXHBA_FCHBADiagnosticSettingData_map.clear();
+  for (const Diagnostic_Row& row : diagnosticTests()) {
+    Ref<Given> given = givenFor(row.name);
+    given->LoopControl.set({3});
+    EXPECT_EQ(lay(given), nullptr) << row.name;
+    EXPECT_EQ(log.count("Could not find the default setting data"), 1u);
+    EXPECT_EQ(log.count(USING), 1u);
+    const bool takesNone = row.number >= Diagnostic_Test::RESET;
+    EXPECT_EQ(log.count(std::string("No Override Setting Supported for test : ") + row.name),
+              takesNone ? 1u : 0u);
+  }
 }
 
 TEST_F(Settings, JobSettingsAreTakenForAllTests) {
@@ -285,6 +369,9 @@ TEST_F(Settings, JobSettingsOfAnotherNameOrClassAreRefused) {
   agent->m_TVXHBA_JobSettingData_map.clear();
   EXPECT_EQ(diagnostics.getDefaultTVXHBA_JobSettingDataInstance(SELF_TEST), nullptr);
   EXPECT_EQ(diagnostics.getTVXHBA_JobSettingDataInstance(givenForJobs().get(), SELF_TEST), nullptr);
+  given->DeleteOnCompletion.set(true);
+  EXPECT_EQ(diagnostics.getTVXHBA_JobSettingDataInstance(given.get(), SELF_TEST), nullptr);
+  EXPECT_EQ(log.count(USING), 2u) << "there is no name that they could differ from";
 }
 
 }  // namespace
