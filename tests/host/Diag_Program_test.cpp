@@ -1,4 +1,6 @@
 // `tvxcim --sim diag` as a person runs it.
+#include <filesystem>
+#include <fstream>
 #include <nlohmann/json.hpp>
 
 #include "Simulated_Program.h"
@@ -30,6 +32,49 @@ TEST_F(DiagProgramTest, TellsThatATestPassed) {
   EXPECT_EQ(result.err.find("TVX:FCHBA Status Test on 10:00:02:54:56:0C:50:10"), 0U) << result.err;
 }
 
+TEST_F(DiagProgramTest, TellsOfTheJobAndTheRecord) {
+  const auto good = nlohmann::json::parse(
+      run("--sim diagnostics --json diag run status 10000254560C5010").out)["run"];
+  EXPECT_EQ(good["passed"], true);
+  EXPECT_EQ(good["job"]["id"], "TVX:FCHBA Status Test:1:65535") << "the first job of a process";
+  EXPECT_EQ(good["job"]["state"], 7);
+  EXPECT_EQ(good["job"]["percent"], 100);
+  EXPECT_EQ(good["record"]["job"], good["job"]["id"]);
+  EXPECT_EQ(good["record"]["LoopsPassed"], 0);
+  EXPECT_TRUE(good["record"]["CompletedCycles"].is_null()) << "this test runs no cycles";
+  const auto gone = nlohmann::json::parse(
+      run("--sim diagnostics --json diag run status 10000254560C5010 --delete-job").out)["run"];
+  EXPECT_EQ(gone["passed"], true) << "the record stands";
+  EXPECT_TRUE(gone["job"].is_null());
+}
+
+TEST_F(DiagProgramTest, TellsWhyATestWasRefused) {
+  const std::filesystem::path path = m_Temporary / "refused.json";
+  const auto refused = [&](int status) {
+    std::ofstream(path) << R"({"cards": [{"model": "TVX16002", "ports": [
+        {"wwpn": "10000254560C4110"}]}], "faults": [{"call": "LRM_ResetHBA", "status": )"
+                        << status << "}]}";
+    return run("--sim=" + path.string() + " --json diag run reset 10000254560C4110");
+  };
+  for (const int status : {64, 63, 2, 190}) {  // busy, unavailable and unsupported
+    const test::Outcome result = refused(status);
+    EXPECT_EQ(result.exitCode, 9) << status << result.err;
+    const auto run = nlohmann::json::parse(result.out)["run"];
+    EXPECT_EQ(run["result"], 40000 + status);
+    EXPECT_EQ(run["passed"], false);
+    EXPECT_TRUE(run["job"].is_null());
+    EXPECT_TRUE(run["record"].is_null());
+  }
+  const test::Outcome failed = refused(148);
+  EXPECT_EQ(failed.exitCode, 12) << failed.err;
+  const auto run = nlohmann::json::parse(failed.out)["run"];
+  EXPECT_EQ(run["result"], 40148);
+  EXPECT_EQ(run["passed"], false);
+  EXPECT_EQ(run["job"]["state"], 10);
+  EXPECT_EQ(run["job"]["percent"], 0);
+  EXPECT_EQ(run["record"]["passed"], false);
+}
+
 TEST_F(DiagProgramTest, TellsThatATestFailedThoughTheMethodAnswersZero) {
   const test::Outcome result =
       run("--sim diagnostics --json diag run 'TVX:FCHBA Internal Loopback Test' 10000254560C5011 "
@@ -45,6 +90,7 @@ TEST_F(DiagProgramTest, TellsThatATestFailedThoughTheMethodAnswersZero) {
                 "TVX:FCHBA Internal Loopback Test Resulted with Failure, Result - Timeout"),
             0U);
   EXPECT_NE(result.err.find("Internal Loopback Test"), std::string::npos);
+  EXPECT_GE(lines(result.err), 2U) << "it is told for how long it has been running: " << result.err;
 }
 
 TEST_F(DiagProgramTest, TellsThatATestLeftNoResult) {

@@ -3,6 +3,9 @@
 
 #include <filesystem>
 #include <fstream>
+#include <functional>
+#include <string>
+#include <vector>
 
 #include "sim/Management.h"
 
@@ -202,19 +205,75 @@ TEST_F(Management, DiagnosticsRunForTheirPollsAndEndAsPlanned) {
   EXPECT_EQ(poll(), 0);
 }
 
-TEST_F(Management, AnEndlessDiagnosticCanBeCanceled) {
-  load_port(R"("diagnostics": {"loopback": {"endless": true}})");
-  std::uint32_t id = 0;
-  RM_DiagResult result{};
-  ASSERT_EQ(SIM_CALL(rm, LRM_DiagLoopBackTestV3, first_port, 1u, 1u, 0u, &id, 0u, "aa"), 0);
-  for (int i = 0; i < 300; ++i) {
-    ASSERT_EQ(SIM_CALL(rm, LRM_DiagGetResults, first_port, id, &result), 0);
-    ASSERT_EQ(result.state, RM_DIAG_RUNNING + 0u);
+// The tests that a port runs by a plan, and how each is started.
+class Planned_Tests : public Management {
+ protected:
+  struct Planned {
+    const char* plan;
+    const char* call;
+    std::function<RM_STATUS(std::uint32_t*)> start;
+  };
+  const std::vector<Planned> planned = {
+      {"post", "LRM_DiagRunPOST",
+       [this](std::uint32_t* made) { return SIM_CALL(rm, LRM_DiagRunPOST, first_port, made); }},
+      {"echo", "LRM_DiagEchoTestV2",
+       [this](std::uint32_t* made) {
+         return SIM_CALL(rm, LRM_DiagEchoTestV2, first_port, wwn(9), 5u, 1u, made, 0u, "aa");
+       }},
+      {"loopback", "LRM_DiagLoopBackTestV3",
+       [this](std::uint32_t* made) {
+         return SIM_CALL(rm, LRM_DiagLoopBackTestV3, first_port, 1u, 5u, 0u, made, 0u, "aa");
+       }},
+      {"pci", "LRM_DiagPciLoopBackTestV2",
+       [this](std::uint32_t* made) {
+         return SIM_CALL(rm, LRM_DiagPciLoopBackTestV2, first_port, 5u, 0u, made, 0u, "aa");
+       }},
+  };
+  void load_plan(const Planned& test, const std::string& plan) {
+    load_port(std::string(R"("diagnostics": {")") + test.plan + R"(": )" + plan + "}");
   }
-  EXPECT_EQ(SIM_CALL(rm, LRM_DiagCancelDiagnostic, first_port, id), 0);
-  EXPECT_EQ(SIM_CALL(rm, LRM_DiagGetResults, first_port, id, &result), 0);
-  EXPECT_EQ(result.state, RM_DIAG_CANCELED + 0u);
-  EXPECT_NE(SIM_CALL(rm, LRM_DiagCancelDiagnostic, first_port, id), 0);
+  RM_STATUS poll() { return SIM_CALL(rm, LRM_DiagGetResults, first_port, id, &result); }
+  RM_DiagResult result{};
+  std::uint32_t id = 0;
+};
+
+TEST_F(Planned_Tests, EndWithAnyResult) {
+  for (const Planned& test : planned)
+    for (const std::uint32_t code : {0u, 1u, 10u, 19u, 20u, 0xFFFFFFFFu}) {
+      load_plan(test, R"({"polls": 0, "result": )" + std::to_string(code) + "}");
+      ASSERT_EQ(test.start(&id), 0) << test.plan;
+      EXPECT_EQ(poll(), 0);
+      EXPECT_EQ(result.state, RM_DIAG_DONE + 0u) << test.plan;
+      EXPECT_EQ(result.result, code) << test.plan;
+    }
+}
+
+TEST_F(Planned_Tests, CanBeRefused) {
+  for (const Planned& test : planned)
+    for (const int status : {64, 63, 2, 190, 62}) {
+      load_plan(test, "{}");
+      const std::string fault = std::string(R"({"call": ")") + test.call + R"(", "status": )" +
+                                std::to_string(status) + "}";
+      ASSERT_EQ(tvxsim_add_fault(fault.c_str()), 0) << tvxsim_last_error();
+      EXPECT_EQ(test.start(&id), status) << test.plan;
+      tvxsim_clear_faults();
+      EXPECT_EQ(test.start(&id), 0) << test.plan;
+    }
+}
+
+TEST_F(Planned_Tests, ThatAreEndlessCanBeCanceled) {
+  for (const Planned& test : planned) {
+    load_plan(test, R"({"endless": true})");
+    ASSERT_EQ(test.start(&id), 0) << test.plan;
+    for (int i = 0; i < 300; ++i) {
+      ASSERT_EQ(poll(), 0);
+      ASSERT_EQ(result.state, RM_DIAG_RUNNING + 0u);
+    }
+    EXPECT_EQ(SIM_CALL(rm, LRM_DiagCancelDiagnostic, first_port, id), 0);
+    EXPECT_EQ(poll(), 0);
+    EXPECT_EQ(result.state, RM_DIAG_CANCELED + 0u) << test.plan;
+    EXPECT_NE(SIM_CALL(rm, LRM_DiagCancelDiagnostic, first_port, id), 0);
+  }
 }
 
 TEST_F(Management, TheTableOfDiagnosticsFillsUp) {

@@ -24,7 +24,9 @@ constexpr const char* testClass = "TVXHBA_FCHBADiagnosticTest";
 constexpr const char* settingClass = "TVXHBA_FCHBADiagnosticSettingData";
 constexpr const char* jobSettingClass = "TVXHBA_JobSettingData";
 constexpr const char* completionClass = "TVXHBA_DiagnosticCompletionRecord";
+constexpr const char* jobClass = "TVXHBA_ConcreteJob";
 constexpr std::uint64_t completedWell = 2;
+constexpr std::uint64_t jobCompleted = 7;
 
 struct DiagWords {
   std::string test;
@@ -122,9 +124,10 @@ nlohmann::ordered_json recordJson(const Instance& record) {
                                  {"time", record.text("CreationTimeStamp")},
                                  {"text", record.text("RecordData")}};
   for (const char* count : {"LoopsPassed", "LoopsFailed", "CompletedCycles", "TimeToExecute"}) {
-    const Value& value = record.property(count);
-    json[count] =
-        value.isNull() ? nlohmann::ordered_json() : nlohmann::ordered_json(value.asUnsigned());
+    // Tests that run no cycles leave some of them out.
+    const Value* const value = record.properties.find(count);
+    const bool isTold = value != nullptr && !value->isNull();
+    json[count] = isTold ? nlohmann::ordered_json(value->asUnsigned()) : nlohmann::ordered_json();
   }
   return json;
 }
@@ -252,22 +255,59 @@ std::unique_ptr<Instance> newRecord(Session& session, const std::set<std::string
   return nullptr;
 }
 
+/// What a run left behind.
+struct DiagOutcome {
+  std::uint64_t result = 0;
+  std::unique_ptr<Instance> job;     // null if there is none, or it is gone already
+  std::unique_ptr<Instance> record;  // null if the run made none
+
+  /// The method's result alone tells no more than that the test could be run.
+  bool passed() const {
+    return result == 0 && record != nullptr && host::passed(*record) &&
+           (job == nullptr || job->text("JobState") == std::to_string(jobCompleted));
+  }
+};
+
+/// The job that the reply names; null if it names none, or one that is not kept.
+std::unique_ptr<Instance> namedJob(Session& session, const Reply& reply) {
+  const Value* const named = reply.outputs.find("Job");
+  if (named == nullptr || named->isNull()) {
+    return nullptr;
+  }
+  for (Instance& job : instancesOf(session, jobClass)) {
+    if (job.path.sameObject(named->asReference())) {
+      return std::make_unique<Instance>(std::move(job));
+    }
+  }
+  return nullptr;
+}
+
+nlohmann::ordered_json jobJson(const Instance& job) {
+  return {{"id", job.text("InstanceID")},
+          {"state", job.property("JobState").asUnsigned()},
+          {"percent", job.property("PercentComplete").asUnsigned()}};
+}
+
 void printOutcome(Session& session, const Instance& test, const Instance& controller,
-                  std::uint64_t result, const Instance* record) {
+                  const DiagOutcome& outcome) {
+  const Instance* const record = outcome.record.get();
+  const nlohmann::ordered_json none;
   if (session.options().format == Format::Json) {
     printJson(session, "run",
               {{"test", shortName(test.text("Name"))},
                {"port", wwnText(controller.text("DeviceID"))},
-               {"result", result},
-               {"passed", result == 0 && record != nullptr && passed(*record)},
-               {"record", record != nullptr ? recordJson(*record) : nlohmann::ordered_json()}});
+               {"result", outcome.result},
+               {"passed", outcome.passed()},
+               {"job", outcome.job != nullptr ? jobJson(*outcome.job) : none},
+               {"record", record != nullptr ? recordJson(*record) : none}});
     return;
   }
   if (record == nullptr) {
-    session.out() << fmt::format("no result: the method answered {} and left no record\n", result);
+    session.out() << fmt::format("no result: the method answered {} and left no record\n",
+                                 outcome.result);
     return;
   }
-  session.out() << fmt::format("{}: {}\n", passed(*record) ? "passed" : "failed",
+  session.out() << fmt::format("{}: {}\n", outcome.passed() ? "passed" : "failed",
                                record->text("RecordData"));
   if (record->has("CompletedCycles") && !record->property("CompletedCycles").isNull()) {
     session.out() << fmt::format("loops passed {}, failed {}; {} cycles in {} s\n",
@@ -276,26 +316,29 @@ void printOutcome(Session& session, const Instance& test, const Instance& contro
   }
 }
 
+Reply runMethod(Session& session, const Instance& test, const Instance& controller,
+                const NamedValues& arguments) {
+  constexpr std::chrono::milliseconds step(1000);
+  const Progress progress(
+      session.err(),
+      fmt::format("{} on {}", test.text("Name"), wwnText(controller.text("DeviceID"))), step,
+      isatty(STDERR_FILENO) == 1);
+  return callMethod(session, test.path, "RunDiagnosticService", arguments);
+}
+
 ExitCode runTest(Session& session, const DiagWords& words) {
   const Instance test = findTest(session, words.test);
   const Instance controller = portController(session, words.port);
   const NamedValues arguments = argumentsOf(session, words, test, controller);
   const std::set<std::string> before = recordNames(session);
-  std::uint64_t result = 0;
-  {
-    constexpr std::chrono::milliseconds step(1000);
-    const Progress progress(
-        session.err(),
-        fmt::format("{} on {}", test.text("Name"), wwnText(controller.text("DeviceID"))), step,
-        isatty(STDERR_FILENO) == 1);
-    result = resultNumber(callMethod(session, test.path, "RunDiagnosticService", arguments));
-  }
-  const std::unique_ptr<Instance> record = newRecord(session, before);
-  printOutcome(session, test, controller, result, record.get());
-  if (record == nullptr && result != 0) {
+  const Reply reply = runMethod(session, test, controller, arguments);
+  const DiagOutcome outcome{resultNumber(reply), namedJob(session, reply),
+                            newRecord(session, before)};
+  printOutcome(session, test, controller, outcome);
+  if (outcome.record == nullptr && outcome.result != 0) {
     return ExitCode::MethodResult;
   }
-  return result == 0 && record != nullptr && passed(*record) ? ExitCode::Ok : ExitCode::TestFailed;
+  return outcome.passed() ? ExitCode::Ok : ExitCode::TestFailed;
 }
 
 }  // namespace
