@@ -4,6 +4,7 @@
 #include <thread>
 
 #include "Agent_Fixture.h"
+#include "Lock_Witness.h"
 #include "tvxsim/tvxsim.h"
 
 namespace cimrt::test {
@@ -168,6 +169,16 @@ TEST_F(Enumeration, ActiveFormUpdatesUnderAllItsLocks) {
   });
   EXPECT_FALSE(mayTakeAny);
   EXPECT_EQ(delivered.size(), 4u);
+}
+
+TEST_F(Enumeration, ActiveFormCopiesUnderTheDataLockAndNotUnderThatOfItsClass) {
+  ProviderAgent& agent = readyAgent();
+  makeDuplicate(agent);
+  Lock_Witness copying("Insert failed for 1");
+  Delivered delivered;
+  agent.enumActiveInstances(agent.m_TVXHBA_FCPort_map, delivered.handler(), noUpdate);
+  EXPECT_TRUE(copying.wasHeld);
+  EXPECT_TRUE(copying.classWasFree);
 }
 #endif
 

@@ -1,7 +1,7 @@
 // The provider of FC ports and its beacon; what active classes answer without their libraries.
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
-#include "Lock_Witness.h"
+#include "../agent/Lock_Witness.h"
 #include "access/TVX_MethodWrapper.h"
 #include "services/TVXHBA_DriverParamGlobal_Provider.h"
 #include "services/TVXHBA_DriverParams_Provider.h"
@@ -121,6 +121,7 @@ TEST_F(FC_Port_Provider, BeaconNeedsAPlaceToGoAndAName) {
 TEST_F(FC_Port_Provider, BeaconIsSwitchedAndKept) {
   build();
   EXPECT_EQ(modify(2), 0);
+  EXPECT_EQ(log.all().at(0).text, " Entering BuildCimrtInfo()");
   EXPECT_EQ(beacon(), 3u);
   EXPECT_EQ(numberOf(entry().LocationIndicator), 2);
   EXPECT_EQ(modify(3), 0);

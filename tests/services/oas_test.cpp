@@ -1,7 +1,7 @@
 // Optimized access storage: units found by the scan, made, deleted and switched off.
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
-#include "Lock_Witness.h"
+#include "../agent/Lock_Witness.h"
 #include "access/TVX_MethodWrapper.h"
 #include "agent/Map_Insert.h"
 #include "agent/ProductSteps.h"
@@ -490,6 +490,20 @@ TEST_F(Optimized_Access, CreationRefusesShortAndMalformedNames) {
   EXPECT_EQ(create("TVX:OAS:Driver:10000000000000G1:50060E801049CF51:1"), 84);
   EXPECT_EQ(tvxsim_calls("LRM_SetOASLunState", nullptr), 0u);
   EXPECT_EQ(agent->m_TVXHBA_DriverParams_map.size(), 1u);
+}
+
+TEST_F(Optimized_Access, EveryChangeLooksFirstWhetherARefreshIsDue) {
+  build();
+  constexpr const char* FIRST_LINE = " Entering BuildCimrtInfo()";
+  log.clear();
+  ASSERT_EQ(create(unitID("Driver", 1)), 0);
+  EXPECT_EQ(log.all().at(0).text, FIRST_LINE);
+  log.clear();
+  ASSERT_EQ(remove(unitID("Driver", 1)), 0);
+  EXPECT_EQ(log.all().at(0).text, FIRST_LINE);
+  log.clear();
+  ASSERT_EQ(disableAll(), 0u);
+  EXPECT_EQ(log.all().at(0).text, FIRST_LINE);
 }
 
 TEST_F(Optimized_Access, CreationFailsWithTheHardware) {

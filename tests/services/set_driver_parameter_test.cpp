@@ -1,8 +1,8 @@
 // Setting a parameter of the driver through its service.
 #include <vector>
 
+#include "../agent/Lock_Witness.h"
 #include "Driver_Params_Test.h"
-#include "Lock_Witness.h"
 #include "services/Service_Checks.h"
 #include "services/TVXHBA_FCHBADriverParamService_Provider.h"
 

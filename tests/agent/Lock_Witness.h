@@ -20,13 +20,16 @@ class Lock_Witness : public TVX_LoggerInterface {
   Lock_Witness& operator=(const Lock_Witness&) = delete;
 
   void log(int, const char*, const unsigned*, const char* text) override {
-    if (text && m_Text == text) wasHeld = !may_take_lock(Lock_Rank::DATA, false);
+    if (!text || m_Text != text) return;
+    wasHeld = !may_take_lock(Lock_Rank::DATA, false);
+    classWasFree = may_take_lock(Lock_Rank::CLASS_STATIC, false);
   }
   void open() override {}
   void close() override {}
   void clear() override {}
 
   bool wasHeld = false;
+  bool classWasFree = false;  ///< the lock of an active class
 
  private:
   std::string m_Text;
