@@ -30,21 +30,31 @@ Reply Whole_Client::count(Reply reply, const std::string& what) {
   return reply;
 }
 
-void Whole_Client::readClass(const ClassData& classData) {
+const ObjectPath* Whole_Client::readInstancesOf(const ClassData& classData) {
   const std::string name = classData.name;
   count(m_Broker.enumerateInstanceNames(name), "names of " + name);
   const Reply all = count(m_Broker.enumerateInstances(name), "instances of " + name);
   m_First.erase(name);
-  if (all.instances.empty()) return;
-  const ObjectPath path = all.instances.front().path;
-  m_First[name] = path;
+  if (all.instances.empty()) return nullptr;
+  const ObjectPath& path = m_First[name] = all.instances.front().path;
   count(m_Broker.getInstance(path), "instance of " + name);
-  if (!classData.isAssociation) count(m_Broker.associatorNames(path), "neighbours of " + name);
+  return &path;
+}
+
+void Whole_Client::readClass(const ClassData& classData) {
+  const ObjectPath* first = readInstancesOf(classData);
+  if (first == nullptr || classData.isAssociation) return;
+  count(m_Broker.associatorNames(*first), std::string("neighbours of ") + classData.name);
 }
 
 void Whole_Client::readEverything() {
   for (const ClassData* each : m_Classes.all())
     if (each->isServed) readClass(*each);
+}
+
+void Whole_Client::readInstances() {
+  for (const ClassData* each : m_Classes.all())
+    if (each->isServed) readInstancesOf(*each);
 }
 
 const ObjectPath* Whole_Client::firstOf(const std::string& className) {

@@ -44,6 +44,8 @@ class Whole_Client {
   void readClass(const host::ClassData& classData);
   /// The same of every class.
   void readEverything();
+  /// Names and instances of every class, and one of each by its path.
+  void readInstances();
   /// Every method of every class, without arguments; then the purposeful calls.
   void callEverything();
   /// One call. A host that lacks the instances that it is about is not asked.
@@ -56,6 +58,8 @@ class Whole_Client {
  private:
   host::Reply count(host::Reply reply, const std::string& what);
   const host::ObjectPath* firstOf(const std::string& className);
+  /// Names, instances and one instance by its path, which is answered; null if there is none.
+  const host::ObjectPath* readInstancesOf(const host::ClassData& classData);
   void callBare(const host::ClassData& classData);
 
   host::Broker& m_Broker;
