@@ -48,6 +48,9 @@ namespace {
 using Json = nlohmann::json;
 using Clock = std::chrono::steady_clock;
 
+/// Entry points that requests reach; those of other wrappers are tried by the tests of src/access.
+constexpr std::size_t REACHED = 73;
+
 struct Choice {
   std::size_t every = 1;
   std::string row;
@@ -79,31 +82,55 @@ struct Row {
 
 // ---- One cell ----
 
-Json scenario() {
+/// What makes the provider call what it calls only when something is amiss.
+struct Nudge {
+  const char* entryPoint;  ///< the one that is amiss
+  const char* members;
+};
+const Nudge NUDGES[] = {
+    {"HBA_GetAdapterAttributes", R"("status": 8, "first": 1)"},  // stale data, to be refreshed
+};
+
+/// The simulated host: it dumps into that folder, and one of its tests goes on for ever, until it
+/// is cancelled.
+Json scenario(const std::string& folder) {
   std::ifstream stream(TVX_MATRIX_SCENARIO);
-  return Json::parse(stream, nullptr, true, true);
+  Json host = Json::parse(stream, nullptr, true, true);
+  host["defaults"]["port"]["diagnostics"] = {{"pci", {{"endless", true}}}};
+  for (Json& card : host["cards"])
+    for (Json& port : card["ports"])
+      if (port.contains("dumps")) port["dumps"]["directory"] = folder;
+  host["cards"][1]["ports"].back().update(
+      {{"type", "loop"}, {"fabric_name", "0000000000000000"}, {"targets", Json::array()}});
+  return host;
+}
+
+void addFault(const std::string& entryPoint, const std::string& members) {
+  const std::string fault = R"({"call": ")" + entryPoint + R"(", )" + members + "}";
+  if (tvxsim_add_fault(fault.c_str()) == 0) return;
+  std::cerr << "fault_matrix: " << fault << ": " << tvxsim_last_error() << "\n";
+  std::_Exit(3);
 }
 
 /// The simulated host, with or without one of its symbols, under one fault.
-void setUp(const std::string& entryPoint, const Fault_Mode* mode) {
-  Json host = scenario();
+void setUp(const std::string& folder, const std::string& entryPoint, const Fault_Mode* mode) {
+  Json host = scenario(folder);
   const bool missing = mode != nullptr && mode->isMissingSymbol();
   if (missing) host["omit_symbols"] = Json::array({entryPoint, "L" + entryPoint});
   if (tvxsim_load_text(host.dump().c_str()) != 0) {
     std::cerr << "fault_matrix: " << tvxsim_last_error() << "\n";
     std::_Exit(3);
   }
-  if (mode == nullptr || missing) return;
-  const std::string fault = R"({"call": ")" + entryPoint + R"(", )" + mode->members + "}";
-  if (tvxsim_add_fault(fault.c_str()) != 0) {
-    std::cerr << "fault_matrix: " << fault << ": " << tvxsim_last_error() << "\n";
-    std::_Exit(3);
-  }
+  for (const Nudge& nudge : NUDGES)
+    if (entryPoint != nudge.entryPoint) addFault(nudge.entryPoint, nudge.members);
+  if (mode != nullptr && !missing) addFault(entryPoint, mode->members);
 }
 
-/// A provider's whole life under one fault.
-void runCell(const host::ClassCatalogue& classes, Progress& progress) {
+/// A provider's whole life under one fault; without one if there is no mode.
+void runCell(const host::ClassCatalogue& classes, const std::string& entryPoint,
+             const Fault_Mode* mode, Progress& progress) {
   const Trial_Root root;
+  setUp(root.files(), entryPoint, mode);
   host::BrokerOptions options;
   options.strict = true;
   options.classes = &classes;
@@ -137,8 +164,7 @@ bool isChosen(const Choice& choice, std::size_t row, std::size_t mode) {
   for (std::size_t i = first; i < modes.size(); ++i) {
     if (!isChosen(choice, row, i)) continue;
     progress.cell = i;
-    setUp(entryPoint, &modes[i]);
-    runCell(classes, progress);
+    runCell(classes, entryPoint, &modes[i], progress);
     progress.libraryCalls += tvxsim_calls(entryPoint.c_str(), nullptr);
     ++progress.cells;
   }
@@ -217,8 +243,7 @@ std::vector<std::string> calledEntryPoints(const host::ClassCatalogue& classes,
   if (pipe(ends) != 0) std::abort();
   const pid_t child = fork();
   if (child == 0) {
-    setUp("", nullptr);
-    runCell(classes, progress);
+    runCell(classes, "", nullptr, progress);
     std::string text;
     for (const std::string& name : offered)
       if (tvxsim_calls(name.c_str(), nullptr) > 0) text += name + "\n";
@@ -362,6 +387,9 @@ int runMatrix(const Choice& choice) {
   const std::vector<std::string> names = calledEntryPoints(classes, sharedProgress());
   if (std::find(names.begin(), names.end(), "RM_InitLib") == names.end())
     throw std::runtime_error("no library was found; LD_LIBRARY_PATH has to name their folder");
+  if (names.size() < REACHED)
+    throw std::runtime_error("the client reaches only " + std::to_string(names.size()) +
+                             " entry points");
   const std::vector<Row> rows = runShares(choice, classes, names);
   const bool good = std::all_of(rows.begin(), rows.end(), isGood);
   if (!choice.report.empty()) {

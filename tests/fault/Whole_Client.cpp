@@ -6,9 +6,11 @@
 namespace tvx::test {
 
 using host::ClassData;
+using host::Instance;
 using host::ObjectPath;
 using host::Reply;
 using host::Request;
+using host::Value;
 
 void Client_Tally::add(const Client_Tally& other) {
   requests += other.requests;
@@ -93,7 +95,29 @@ void Whole_Client::call(const Method_Call& call) {
   }
 }
 
+void Whole_Client::runTests() {
+  const auto controllers = m_Broker.enumerateInstances("TVXHBA_PortController").instances;
+  if (controllers.empty()) return;
+  for (const Instance& test : m_Broker.enumerateInstances("TVXHBA_FCHBADiagnosticTest").instances) {
+    Instance settings;
+    settings.path.className = "TVXHBA_FCHBADiagnosticSettingData";
+    settings.properties.set("InstanceID", test.property("Name"));
+    settings.properties.set("TargetDevice", Value::string("500C0FF12A001001"));
+    settings.properties.set("LoopControlParameter",
+                            Value::array(CMPI_string, {Value::string("2")}));
+    // The last port may have a plug in place of a fabric.
+    const bool wantsPlug = test.text("Name").find("External") != std::string::npos;
+    const Instance& controller = wantsPlug ? controllers.back() : controllers.front();
+    ++m_Tally.methods;
+    count(m_Broker.invokeMethod(test.path, "RunDiagnosticService",
+                                {{"ManagedElement", Value::reference(controller.path)},
+                                 {"DiagnosticSettings", Value::embedded(std::move(settings))}}),
+          test.text("Name"));
+  }
+}
+
 void Whole_Client::callEverything() {
+  runTests();  // first: later calls disable ports
   for (const ClassData* each : m_Classes.all())
     if (each->isServed) callBare(*each);
   for (const Method_Call& each : purposefulCalls(m_Folder)) call(each);
@@ -101,14 +125,15 @@ void Whole_Client::callEverything() {
 
 void Whole_Client::changeEverything() {
   for (const char* name : {"TVXHBA_ProviderConfigSetting", "TVXHBA_FCPort", "TVXHBA_DriverParams",
-
                            "TVXHBA_DriverParamGlobal", "TVXHBA_DumpData", "TVXHBA_VirtualFCPort"}) {
     const ClassData* classData = m_Classes.find(name);
     const ObjectPath* first = firstOf(name);
     if (classData == nullptr || first == nullptr) continue;
     const Reply found = count(m_Broker.getInstance(*first), std::string("get ") + name);
     if (found.instances.empty()) continue;
-    host::Instance instance = found.instances.front();
+    Instance instance = found.instances.front();
+    if (instance.has("RetentionCount"))
+      instance.properties.set("RetentionCount", Value::number(CMPI_uint32, 3));
     count(m_Broker.modifyInstance(instance), std::string("modify ") + name);
     count(m_Broker.createInstance(instance), std::string("create ") + name);
     count(m_Broker.deleteInstance(*first), std::string("delete ") + name);

@@ -60,6 +60,8 @@ class Whole_Client {
   const host::ObjectPath* firstOf(const std::string& className);
   /// Names, instances and one instance by its path, which is answered; null if there is none.
   const host::ObjectPath* readInstancesOf(const host::ClassData& classData);
+  /// Every diagnostic test, on the first port, with settings of its own.
+  void runTests();
   void callBare(const host::ClassData& classData);
 
   host::Broker& m_Broker;
