@@ -34,3 +34,12 @@ function(tvx_add_library name)
   add_library(${name} STATIC ${ARGN})
   target_link_libraries(${name} PUBLIC tvx_includes PRIVATE tvx_warnings)
 endfunction()
+
+# tvx_link_provider_library(target exports): what makes a shared library one that a CIM server loads. The version script
+# `exports` names what leaves it and hides the rest.
+function(tvx_link_provider_library target exports)
+  target_link_libraries(${target} PRIVATE tvx_warnings Threads::Threads ${CMAKE_DL_LIBS})
+  target_link_options(${target} PRIVATE
+    "LINKER:--version-script=${exports}" LINKER:--no-undefined LINKER:--as-needed)
+  set_target_properties(${target} PROPERTIES LINK_DEPENDS "${exports}")
+endfunction()

@@ -198,12 +198,22 @@ Test_Classes build() {
                   .reference("Left", made.part, FLAG_KEY)
                   .reference("Right", made.part, FLAG_KEY)
                   .build_class("TEST_Peer", FLAG_ASSOCIATION);
+  made.tie = Record_Builder()
+                 .reference("Owner", made.keys, FLAG_KEY)
+                 .property("Slot", UINT16, FLAG_KEY)
+                 .property("Place", SINT8, FLAG_KEY)
+                 .build_class("TEST_Tie", FLAG_ASSOCIATION);
+  made.odd = Record_Builder()
+                 .property("Id", STRING, FLAG_KEY)
+                 .method(Record_Builder().build_method("Test_ODD", UINT32))
+                 .build_class("TEST_Odd");
   return made;
 }
 
 const Meta_Repository* enter(const Test_Classes& made) {
   static const std::vector<const Meta_Class*> classes = {
-      made.element, made.part, made.spare, made.keys, made.all, made.link, made.triple, made.peer};
+      made.element, made.part,   made.spare, made.keys, made.all,
+      made.link,    made.triple, made.peer,  made.tie,  made.odd};
   static const Meta_Repository repository = {classes.data(), classes.size()};
   for (const Meta_Class* each : classes)
     const_cast<Meta_Class*>(each)->meta_repository = &repository;

@@ -46,6 +46,8 @@ struct Test_Classes {
   const Meta_Class* link;  ///< TEST_Link: keys Antecedent (element), Dependent (part); string Note
   const Meta_Class* triple;  ///< TEST_Triple: keys First, Second, Third (elements)
   const Meta_Class* peer;    ///< TEST_Peer: keys Left, Right (parts)
+  const Meta_Class* tie;     ///< TEST_Tie: keys Owner (keys), Slot uint16, Place sint8
+  const Meta_Class* odd;     ///< TEST_Odd: key string Id; a method of the class's own name
   const Meta_Method* run;  ///< TEST_All.Run: every scalar In as I<type>, Out as O<type>, more below
   const Meta_Method* ping;  ///< TEST_All.Ping: static, no parameters
 

@@ -1,0 +1,22 @@
+// Instances of the test classes as texts: `TEST_Link(Antecedent=TEST_Element(Id=e1), Note=n)`.
+#pragma once
+
+#include <string>
+#include <string_view>
+
+#include "runtime/Instance.h"
+
+namespace cimrt::test {
+
+/// An instance with the features that the text names; all others are null. A namespace may stand
+/// before the class, with a colon between them. Values are texts, integers and nested instances.
+/// Throws std::logic_error for any other text.
+Ref<Instance> object_of(std::string_view text);
+
+/// Sets a feature: "Name=value".
+void assign(Instance* instance, std::string_view text);
+
+/// The features that are not null, in the order of the class; texts in quotes, lists in braces.
+std::string describe(const Instance* instance);
+
+}  // namespace cimrt::test
