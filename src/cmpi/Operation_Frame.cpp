@@ -53,10 +53,10 @@ Context_Guard::~Context_Guard() {
 
 void log_return(const char* function, const Outcome& outcome) {
   const char* code = name_of_code(outcome.logged);
-  if (outcome.detail.empty())
-    CIMRT_TRACE(LOG_DBG_, "return: %s(): %s", function, code);
+  if (outcome.detail)
+    CIMRT_TRACE(LOG_DBG_, "return: %s(): %s %s", function, code, outcome.detail->c_str());
   else
-    CIMRT_TRACE(LOG_DBG_, "return: %s(): %s %s", function, code, outcome.detail.c_str());
+    CIMRT_TRACE(LOG_DBG_, "return: %s(): %s", function, code);
 }
 
 }  // namespace cimrt

@@ -4,6 +4,7 @@
 
 #include <exception>
 #include <memory>
+#include <optional>
 
 #include "cmpi/CMPI_Adapter.h"
 #include "cmpi/CMPI_Thread_Context.h"
@@ -14,11 +15,11 @@ namespace cimrt {
 /// What an operation ends with.
 struct Outcome {
   Outcome(CMPIrc code) : answer(code), logged(code) {}
-  Outcome(CMPIrc code, String text) : answer(code), logged(code), detail(std::move(text)) {}
+  Outcome(CMPIrc code, const char* text) : answer(code), logged(code), detail(text) {}
 
   CMPIrc answer;  ///< what the server gets
   CMPIrc logged;  ///< what the return line says; differs from the answer in a few cases
-  String detail;  ///< appended to the return line unless empty
+  std::optional<String> detail{};  ///< appended to the return line, even if it is empty
 };
 
 /// A status with this code and no message.

@@ -18,7 +18,7 @@ class Exceptions : public Built_Bridge {
     EXPECT_EQ(reply.status.rc, CMPI_RC_ERR_FAILED) << what;
     EXPECT_FALSE(reply.done) << what;
     EXPECT_EQ(ending(), std::string(name) + "(): CMPI_RC_ERR_FAILED") << what;
-    EXPECT_EQ(texts("DBG").size(), lines.size()) << what;
+    EXPECT_TRUE(texts("ERR").empty() && texts("FATAL").empty()) << what;
   }
   Request part_request(Call call) const {
     Request made = request(call, path("TEST_Part", "a"));
@@ -75,7 +75,8 @@ TEST_F(Exceptions, EndWalksAsFailures) {
     std::uint32_t operation;
     Call call;
     const char* name;
-  } rows[] = {{OPERATION_ENUM_INSTANCES, Call::AssociatorNames, "associatorNames"},
+  } rows[] = {{OPERATION_ENUM_INSTANCES, Call::Associators, "associators"},
+              {OPERATION_ENUM_INSTANCES, Call::AssociatorNames, "associatorNames"},
               {OPERATION_ENUM_INSTANCES, Call::References, "references"},
               {OPERATION_ENUM_INSTANCES, Call::ReferenceNames, "referenceNames"},
               {OPERATION_ENUM_ASSOCIATOR_NAMES, Call::AssociatorNames, "associatorNames"},

@@ -3,6 +3,7 @@
 #include <dlfcn.h>
 
 #include "Built_Fixture.h"
+#include "Library_Blocks.h"
 
 namespace cimrt::test {
 namespace {
@@ -38,6 +39,16 @@ TEST_F(Built_Life, OnlyFactoriesAndTheModuleAreSeenFromOutside) {
                            "TEST_Part_Provider_Create_IndicationMI"})
     EXPECT_EQ(dlsym(library, name), nullptr) << name;
   dlclose(library);
+}
+
+TEST_F(Built_Life, AClassGivesAllItsMemoryBack) {
+  cleanup(make<CMPIInstanceMI>('I'));  // makes the class descriptions as well, which stay
+  control->reset();
+  const std::size_t before = Library_Blocks::live();
+  auto* instance = make<CMPIInstanceMI>('I');
+  EXPECT_GT(Library_Blocks::live(), before) << "the adapter and its provider are not seen";
+  EXPECT_EQ(cleanup(instance), CMPI_RC_OK);
+  EXPECT_EQ(Library_Blocks::live(), before);
 }
 
 TEST_F(Built_Life, FactoriesLeaveTheStatusAlone) {

@@ -54,9 +54,7 @@ class Reader {
     const Meta_Class* found = find_meta_class(Test_Classes::get().repository, class_name.c_str());
     if (!found) refuse("no such class", class_name);
     Ref<Instance> made(create(found, false));
-    nullify_properties(made.get(), true, true, true);
-    for (std::uint64_t i = 0; i < found->num_meta_features; ++i)
-      if (std::uint8_t* flag = null_flag(made.get(), found->meta_features[i])) *flag = 1;
+    empty(made.get());
     return made;
   }
 
@@ -67,6 +65,15 @@ class Reader {
         break;
       case STRING:
         value.set(String(until(",)").c_str()));
+        break;
+      case DATETIME:
+        value.set(Datetime(until(",)").c_str()));
+        break;
+      case REAL32:
+        value.set(std::strtof(until(",)").c_str(), nullptr));
+        break;
+      case REAL64:
+        value.set(std::strtod(until(",)").c_str(), nullptr));
         break;
       default:
         integer(type, value);
@@ -93,6 +100,10 @@ class Reader {
         return value.set(bits);
       case SINT64:
         return value.set(static_cast<std::int64_t>(bits));
+      case BOOLEAN:
+        return value.set(text == std::string("true"));
+      case CHAR16:
+        return value.set(static_cast<char16_t>(bits));
       default:
         refuse("no values of this type", text);
     }
@@ -153,6 +164,13 @@ std::string describe_value(const Instance* instance, const Meta_Feature* feature
 }
 
 }  // namespace
+
+void empty(Instance* instance) {
+  nullify_properties(instance, true, true, true);
+  const Meta_Record* record = instance->meta_class;
+  for (std::uint64_t i = 0; i < record->num_meta_features; ++i)
+    if (std::uint8_t* flag = null_flag(instance, record->meta_features[i])) *flag = 1;
+}
 
 Ref<Instance> object_of(std::string_view text) {
   return Reader(text).object();

@@ -60,7 +60,7 @@ void up_change(const Stage& stage, int (*call)(const char*, const Instance*),
 /// Calls TEST_All.Run of the object, or without one of nothing at all.
 void up_invoke(const Stage& stage, const std::string& object) {
   const Ref<Instance> record(create(Test_Classes::get().run));
-  nullify_properties(record.get(), true, true, true);
+  empty(record.get());
   const Ref<Instance> target = object.empty() ? Ref<Instance>() : object_of(object);
   const int answer = cimom::invoke_method(NAME_SPACE, target.get(), record.get());
   stage.note("invoked " + std::to_string(answer) + " " + describe(record.get()));
