@@ -28,7 +28,7 @@ void malloc_memcpy(benchmark::State& state) {
 BENCHMARK(malloc_memcpy)->Arg(sizeof(T_Device))->Arg(sizeof(T_All))->Arg(33)->Arg(8192);
 
 Ref<T_Device> full_device(std::uint32_t number) {
-  Ref<T_Device> device = make_device("fc-port-10:00:00:00:c9:00:00:01", number);
+  Ref<T_Device> device = make_device("fc-port-10:00:00:00:54:00:00:01", number);
   device->Caption.set("a caption of usual length");
   device->Speed.set(std::uint64_t{16});
   return device;

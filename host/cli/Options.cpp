@@ -22,10 +22,11 @@ std::string footer() {
          "\nExamples:\n"
          "  tvxcim --sim ports\n"
          "  tvxcim --sim ei TVXHBA_Chip --property-list Tag,BoardTemperature\n"
-         "  tvxcim --sim --mof gi TVXHBA_FCPort.DeviceID=\"10000000c9000001\"\n"
-         "  tvxcim --sim ain TVXHBA_FCPort --assoc-class TVXHBA_ControlledBy\n"
+         "  tvxcim --sim --mof gi 'TVXHBA_FCPort.DeviceID=\"10000254560C4110\"'\n"
+         "  tvxcim --sim ain 'TVXHBA_FCPort.DeviceID=\"10000254560C4110\"' --assoc-class "
+         "TVXHBA_ControlledBy\n"
          "  tvxcim --sim cm TVXHBA_SoftwareInstallationService SetPortEnabled \\\n"
-         "      Target=TVXHBA_FCPort.DeviceID=... PortEnabled=false\n";
+         "      'Target=TVXHBA_FCPort.DeviceID=\"10000254560C4111\"' PortEnabled=false\n";
 }
 
 /// Holds what CLI11 writes into until the parse is over.

@@ -1,49 +1,25 @@
 #!/usr/bin/env python3
-"""Runs the commands that the documents show and compares what they print.
+"""Runs the commands that the documents show, and compares what they print.
 
-A block marked `console` holds lines "$ command" with the expected output behind each; a line "..." in
-it stands for any number of lines. Every command must end with 0, unless the block shows otherwise by
-`; echo "exit code $?"`. The commands of one document share a folder and a simulated host of its own.
+A block marked `console` holds lines "$ command" with the expected output behind each; a line "..." in it stands
+for any number of lines. A block marked `sh` holds commands alone. Both run in a shell of their own, in a copy of
+the tree that a document keeps; a listener runs until its block ends. Every command must end with 0, unless the block
+shows otherwise by `; echo "exit code $?"`. Commands that build or change the machine meet stand-ins (stand_in.py);
+the few that are not run are listed with their reasons (listed.py). Commands in running text are checked by what
+their programs tell of themselves. Blocks of other kinds say so, so that no command escapes.
 
-usage: run_documents.py --bin FOLDER FILE.md...
+usage: run_documents.py --build FOLDER --source FOLDER
 """
 import argparse
-import os
 import re
-import subprocess
 import sys
-import tempfile
+from concurrent.futures import ThreadPoolExecutor
+from pathlib import Path
 
-SECONDS = 120
-
-
-def blocks(path):
-    """(line number, lines) of each console block."""
-    inside, first, lines, indent = False, 0, [], 0
-    for number, line in enumerate(open(path, encoding="utf-8"), 1):
-        line = line.rstrip("\n")
-        if not inside and line.strip() == "```console":
-            inside, first, lines, indent = True, number + 1, [], line.index("`")
-        elif inside and line.strip() == "```":
-            inside = False
-            yield first, lines
-        elif inside:
-            lines.append(line[indent:])
-
-
-def commands(first, lines):
-    """(line number, command, expected lines) of each command of a block; a trailing backslash goes on."""
-    found = []
-    for offset, line in enumerate(lines):
-        if line.startswith("$ "):
-            found.append([first + offset, line[2:], []])
-        elif found and found[-1][1].endswith("\\"):
-            found[-1][1] = found[-1][1][:-1] + line.strip()
-        elif found:
-            found[-1][2].append(line)
-        else:
-            raise ValueError("line %d: a console block starts with '$ command'" % first)
-    return found
+import documents
+import listed
+import words_in_text
+from session import SERVERS, Session
 
 
 def matches(expected, actual):
@@ -56,43 +32,104 @@ def matches(expected, actual):
     return re.fullmatch(pattern, "".join(line.rstrip() + "\n" for line in actual)) is not None
 
 
-def run(path, environment, folder):
-    """Failures of one document."""
-    failures, count = [], 0
-    for first, lines in blocks(path):
-        for number, command, expected in commands(first, lines):
-            count += 1
-            done = subprocess.run(["bash", "-c", command], cwd=folder, env=environment, text=True,
-                                  stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=SECONDS)
-            place = "%s:%d: %s" % (os.path.basename(path), number, command)
-            if done.returncode != 0:
-                failures.append("%s\n  ended with %d:\n%s" % (place, done.returncode, done.stdout))
-            elif not matches(expected, done.stdout.splitlines()):
+def without_comment(text):
+    return re.sub(r"\s+# .*$", "", text)
+
+
+def run_block(session, place, block, used):
+    """(number of commands run, failures) of a block; one that registers is run with both kinds of servers."""
+    commands, failures = [], []
+    for command in documents.shell_commands(block):
+        text = without_comment(command.text)
+        if text in listed.LISTED:
+            used.add(text)
+            wrong = listed.script_help(session.source, text.split())
+            failures += ["%s:%d: %s" % (place, command.line, wrong)] if wrong else []
+        else:
+            commands.append(command)
+    registers = any(command.text.startswith("torvex-fc-register") for command in commands)
+    for server in SERVERS if registers else ["pegasus"]:
+        session.asked.write_text("")
+        results = session.run([command.text for command in commands], server)
+        for command, result in zip(commands, results):
+            where = "%s:%d: %s" % (place, command.line, command.text)
+            if result.status != 0:
+                failures.append("%s\n  ended with %d:\n%s" % (where, result.status, result.output))
+            elif not matches(command.expected, result.output.splitlines()):
                 failures.append("%s\n  printed:\n%s  instead of:\n%s" %
-                                (place, done.stdout, "\n".join(expected)))
-    return count, failures
+                                (where, result.output, "\n".join(command.expected)))
+        if results[-1].status > 0:
+            failures.append("%s:%d: the listener ended with %d" % (place, block.line, results[-1].status))
+    return len(commands), failures
+
+
+def run_blocks(place, blocks, words):
+    """What run_block gives, over several blocks in one tree; and the listed commands that were met."""
+    session, used, count, failures = Session(words.source, words.build), set(), 0, []
+    try:
+        if any(line.startswith("torvex-fc-register") for block in blocks for line in block.lines):
+            installed = session.run(["cmake --install build/release"])[0]
+            failures += [installed.output] if installed.status != 0 else []
+        for block in blocks:
+            run, wrong = run_block(session, place, block, used)
+            count, failures = count + run, failures + wrong
+    finally:
+        session.close()
+    return place, count, failures, used
+
+
+def read_document(path, source):
+    """Blocks of commands, those in running text among them, and failures of what else stands there."""
+    found, prose = documents.blocks(path)
+    documents.check_forms(path, found, prose)
+    checker = words_in_text.Checker(source, path.parent)
+    result, failures = [block for block in found if block.language in documents.COMMANDS], []
+    for line, text in documents.code_words(prose):
+        wrong = checker.check(text)
+        failures += ["%s:%d: `%s`: %s" % (path.name, line, text, wrong)] if wrong else []
+        if words_in_text.RUN.match(text):
+            result.append(documents.Block(line - 1, "sh", [text]))
+    return result, failures
+
+
+def collect(words):
+    """(name, blocks) of all places of commands, and failures of reading them."""
+    places, failures = [], []
+    source = Path(words.source)
+    words_in_text.Checker.program = Path(words.build) / "bin/tvxcim"
+    for path in documents.all_documents(source):
+        try:
+            blocks, wrong = read_document(path, source)
+            places.append((str(path.relative_to(source)), blocks))
+            failures += wrong
+        except documents.Mistake as mistake:
+            failures.append(str(mistake))
+    for page in sorted(source.glob("*/*.[18]")) + sorted(source.glob("*/man/*.[18]")):
+        places.append((page.name, [documents.manual_examples(page)]))
+    help_text = words_in_text.Checker.help_of([])
+    places.append(("tvxcim --help", [documents.help_examples(help_text)]))
+    return places, failures
 
 
 def main():
     parser = argparse.ArgumentParser(description=__doc__.splitlines()[0])
-    parser.add_argument("--bin", required=True, help="folder of tvxcim")
-    parser.add_argument("--source", required=True, help="the source tree, $TVX_SOURCE for the commands")
-    parser.add_argument("documents", nargs="+")
+    parser.add_argument("--build", required=True, help="the build whose programs are run")
+    parser.add_argument("--source", required=True, help="the source tree")
     words = parser.parse_args()
-    total, failures = 0, []
-    for document in words.documents:
-        with tempfile.TemporaryDirectory(prefix="tvx_documents_") as folder:
-            environment = {**os.environ, "PATH": words.bin + ":" + os.environ["PATH"], "TMPDIR": folder,
-                           "HOME": folder, "TVX_SOURCE": words.source}
-            for name in ("TVX_ROOT", "TVX_SIM_STATE", "TVX_SIM_SCENARIO", "LD_LIBRARY_PATH"):
-                environment.pop(name, None)
-            count, found = run(document, environment, folder)
-        print("%s: %d commands, %d failures" % (os.path.basename(document), count, len(found)))
-        total += count
-        failures += found
+    places, failures = collect(words)
+    used = set()
+    with ThreadPoolExecutor(2) as pool:
+        for place, count, wrong, met in pool.map(lambda each: run_blocks(*each, words), [p for p in places if p[1]]):
+            print("%s: %d commands, %d failures" % (place, count, len(wrong)))
+            failures += wrong
+            used |= met
+            if count == 0 and not met:
+                failures.append("%s: no command was found" % place)
+    failures += ["%s is listed, and no document has it" % text for text in set(listed.LISTED) - used]
     print("\n".join(failures))
-    return 1 if failures or total == 0 else 0
+    return 1 if failures else 0
 
 
 if __name__ == "__main__":
+    sys.dont_write_bytecode = True
     sys.exit(main())

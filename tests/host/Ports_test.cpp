@@ -17,7 +17,7 @@ Instance port(const char* serial) {
   Instance instance;
   instance.path.className = "TVXHBA_FCPort";
   instance.properties = {
-      {"DeviceID", Value::string("10000000C9000001")},
+      {"DeviceID", Value::string("1000000054000001")},
       {"AdapterName", Value::string("adapter-1")},
       {"Speed", Value::number(CMPI_uint64, 16000000000)},
       {"MaxSpeed", Value::number(CMPI_uint64, 32000000000)},
@@ -48,7 +48,7 @@ TEST(PortsTest, TheTableIsInWords) {
   EXPECT_EQ(portTable(portRows({port("SN1")}, {card("SN1", "TVX-1")})),
             "WWPN                     MODEL  SPEED      STATE  TYPE  FC ID     FABRIC              "
             "     FIRMWARE\n"
-            "10:00:00:00:C9:00:00:01  TVX-1  16 Gbit/s  OK     N     0x010203  "
+            "10:00:00:00:54:00:00:01  TVX-1  16 Gbit/s  OK     N     0x010203  "
             "20:00:00:00:00:00:00:01  12.8\n");
   EXPECT_EQ(portTable({}), "no FC ports\n");
 }
@@ -92,7 +92,7 @@ TEST(PortsTest, StatusAndTypeValuesHaveWords) {
 TEST(PortsTest, SpeedsAndNamesAreWrittenForPeople) {
   EXPECT_EQ(speedWords(1000000000), "1 Gbit/s");
   EXPECT_EQ(speedWords(1500000000), "1500000000 bit/s");
-  EXPECT_EQ(wwnText("10000000c9000001"), "10:00:00:00:c9:00:00:01");
+  EXPECT_EQ(wwnText("10000000540000ab"), "10:00:00:00:54:00:00:ab");
   EXPECT_EQ(wwnText("not a name 12345"), "not a name 12345");
   EXPECT_EQ(wwnText(""), "");
 }
