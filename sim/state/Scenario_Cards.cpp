@@ -206,9 +206,7 @@ Port read_port(const Json_Reader& reader, const Json_Reader& card_reader, World&
   read_attributes(reader, "attributes", port_attribute_rows(), port.values, port.omitted);
   read_port_features(reader, port);
   read_product(reader, card, port);
-  for (const Json_Reader& target : reader.objects("targets")) {
-    port.targets.push_back(read_target(target));
-  }
+  port.targets = read_targets(reader);
   reader.finish();
   return port;
 }

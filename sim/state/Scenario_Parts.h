@@ -12,8 +12,8 @@ void read_card(const Json_Reader& card, World& world);
 /// Reads what is said of a port's link; the rest of it stays.
 void read_link(const Json_Reader& port_reader, Port& port);
 
-/// Reads one element of the "targets" of a port.
-Target read_target(const Json_Reader& target);
+/// Reads the "targets" of a port. An element may stand for several of them.
+std::vector<Target> read_targets(const Json_Reader& port_reader);
 
 /// Reads what a port offers to management; its identity and link must be known already.
 void read_port_features(const Json_Reader& port_reader, Port& port);

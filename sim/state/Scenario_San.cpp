@@ -60,14 +60,13 @@ Lun_Group read_group(const Json_Reader& reader, const Target& target) {
   return group;
 }
 
-}  // namespace
-
-Target read_target(const Json_Reader& reader) {
+// The target at `position` of those that one element makes; their names and addresses count up.
+Target read_target(const Json_Reader& reader, std::uint32_t position) {
   Target target;
-  target.names.port = reader.wwn("wwpn", {});
   if (!reader.has("wwpn")) reader.fail("wwpn", "is missing");
+  target.names.port = wwn_from_number(wwn_number(reader.wwn("wwpn", {})) + position);
   target.names.node = reader.wwn("wwnn", target.names.port);
-  target.fc_id = reader.number<std::uint32_t>("fc_id", 0x010000);
+  target.fc_id = reader.number<std::uint32_t>("fc_id", 0x010000) + position;
   if (reader.raw("luns").is_object()) {
     target.groups.push_back(read_group(*reader.object("luns"), target));
   } else {
@@ -75,8 +74,20 @@ Target read_target(const Json_Reader& reader) {
       target.groups.push_back(read_group(group, target));
     }
   }
-  reader.finish();
   return target;
+}
+
+}  // namespace
+
+std::vector<Target> read_targets(const Json_Reader& port_reader) {
+  std::vector<Target> targets;
+  for (const Json_Reader& element : port_reader.objects("targets")) {
+    const auto count = element.number<std::uint16_t>("count", 1);
+    if (count == 0) element.fail("count", "counts from 1");
+    for (std::uint32_t i = 0; i < count; ++i) targets.push_back(read_target(element, i));
+    element.finish();
+  }
+  return targets;
 }
 
 }  // namespace tvx::sim

@@ -235,6 +235,31 @@ TEST_F(San, ADelayIsThatOfOneCommandOfOneUnit) {
   EXPECT_EQ(response[1], 0x83) << "the answer is the same";
 }
 
+TEST_F(San, OneElementMakesManyTargets) {
+  ASSERT_EQ(tvxsim_load_text(R"({"cards": [{"model": "TVX16001", "ports": [{"targets": [
+      {"wwpn": "500C0FF0000000FE", "wwnn": "500C0FF000000000", "fc_id": "0x010100", "count": 3,
+       "luns": [{"first": 0, "count": 2}, {"first": 9, "type": 12}]}]}]}]})"),
+            0)
+      << tvxsim_last_error();
+  handle = open("Torvex-TVX16001-1");
+  const HBA_FCPTARGETMAPPING* mapping = map(256);
+  ASSERT_EQ(mapping->NumberOfEntries, 9u);
+  const HBA_FCPSCSIENTRY& last = mapping->entry[8];
+  EXPECT_EQ(number(last.FcpId.PortWWN), 0x500C0FF000000100ULL);
+  EXPECT_EQ(number(last.FcpId.NodeWWN), 0x500C0FF000000000ULL);
+  EXPECT_EQ(last.FcpId.FcId, 0x010102u);
+  EXPECT_EQ(last.ScsiId.ScsiTargetNumber, 2u);
+  EXPECT_EQ(inquire(0x500C0FF0000000FFULL, fcp_lun({0, 9}), 0, 0), 0u);
+  EXPECT_EQ(response[0], 12);
+  EXPECT_EQ(inquire(0x500C0FF000000101ULL, fcp_lun({0, 9}), 0, 0), 27u);
+  EXPECT_NE(tvxsim_load_text(R"({"cards": [{"ports": [{"targets": [
+      {"wwpn": "500C0FF0000000FE", "count": 0}]}]}]})"),
+            0);
+  EXPECT_NE(std::string(tvxsim_last_error()).find("/targets/0/count: counts from 1"),
+            std::string::npos)
+      << tvxsim_last_error();
+}
+
 TEST_F(San, AHundredThousandUnitsAreMapped) {
   ASSERT_EQ(tvxsim_load_text(R"({"cards": [{"model": "TVX16001", "ports": [{"targets": [
       {"wwpn": "500C0FF000000001", "luns": {"count": 100000}}]}]}]})"),
