@@ -92,6 +92,7 @@ std::set<std::string> filledIn(const Instance* instance) {
 
 void Diagnostics_Test::SetUp() {
   Agent_Test::SetUp();
+  getLogger().registerInterface(&m_Levels);
   takenOver = {};
   sleptMicroseconds = 0;
   setDlOperations(&OPERATIONS);

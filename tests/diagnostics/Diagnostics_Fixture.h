@@ -7,6 +7,7 @@
 
 #include "../agent/Agent_Fixture.h"
 #include "../agent/Instance_Checks.h"
+#include "Level_Watch.h"
 #include "access/TVX_MethodWrapper.h"
 #include "agent/Map_Insert.h"
 #include "diagnostics/DiagnosticInstances.h"
@@ -86,6 +87,9 @@ class Diagnostics_Test : public Agent_Test {
   static Taken_Over& taken();
 
   ProviderAgent* agent = nullptr;
+
+ private:
+  Level_Watch m_Levels;
 };
 
 }  // namespace cimrt::test

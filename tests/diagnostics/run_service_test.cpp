@@ -1,4 +1,8 @@
 // The request to run a test: its arguments, and what it hands out.
+#include <atomic>
+#include <chrono>
+#include <thread>
+
 #include "Diagnostics_Fixture.h"
 #include "Refused_Calls.h"
 
@@ -187,6 +191,33 @@ TEST_F(Run_Service, HandsOutAJobOfItsOwn) {
   const TVXHBA_ConcreteJob* kept = agent->m_TVXHBA_ConcreteJob_map[0];
   EXPECT_NE(ran.job.get(), kept);
   EXPECT_TRUE(identical(ran.job.get(), kept));
+}
+
+TEST_F(Run_Service, HoldsTheDataLockToTheEndOfTheTest) {
+  std::atomic<bool> gotIn{false};
+  std::thread other;
+  taken().getResults = [&](HBA_WWN, std::uint32_t, RM_DiagResult* result) {
+    other = std::thread([&] {
+      const Ranked_Lock lock(agent->m_DataMutex);
+      EXPECT_EQ(agent->m_TVXHBA_DiagnosticCompletionRecord_map.size(), 1u) << "all is there";
+      gotIn = true;
+    });
+    std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    EXPECT_FALSE(gotIn);
+    result->state = RM_DIAG_DONE;
+    return RM_STATUS{RM_OK};
+  };
+  EXPECT_EQ(run(SELF_TEST).result, 0);
+  other.join();
+  EXPECT_TRUE(gotIn);
+}
+
+TEST_F(Run_Service, AsksForARefreshThatIsDue) {
+  const Ref<TVXHBA_FCHBADiagnosticTest> model(clone(test(STATUS_TEST)));
+  agent->m_bAdapterRefreshPending = true;
+  EXPECT_EQ(ask(model.get(), nullptr), 5);
+  awaitIdle(*agent);
+  EXPECT_EQ(log.count("Clearing TVX CDM maps"), 1u);
 }
 
 TEST_F(Run_Service, OverridesStayForLaterRuns) {
