@@ -3,12 +3,11 @@
 #include <atomic>
 #include <chrono>
 #include <filesystem>
-#include <fstream>
 #include <functional>
 #include <thread>
 
 #include "Failing_Allocations.h"
-#include "Provider_Fixture.h"
+#include "Traced_Library.h"
 #include "broker/Objects.h"
 #include "broker/Scope.h"
 
@@ -177,34 +176,7 @@ TEST_F(Boundary, AnAllocationThatFailsEndsTheRequestAndNoMore) {
 
 // ---- What the log tells and the server does not hear
 
-/// The library with its trace log at the finest level, in the test's root folder.
-class Traced : public Provider_Test {
- protected:
-  void SetUp() override {
-    Provider_Test::SetUp();
-    writeFile(".cimrtrc", "LOG_LEVEL = DBG\n");
-    setenv("CIMRT_HOME", root.c_str(), 1);
-    load();
-  }
-  void TearDown() override {
-    Provider_Test::TearDown();
-    unsetenv("CIMRT_HOME");
-  }
-
-  /// The lines that a request writes, without date and place.
-  std::vector<std::string> linesOf(const std::function<Reply()>& request, int expected) {
-    std::filesystem::resize_file(root / ".cimrt/messages", 0);
-    const Reply reply = request();
-    EXPECT_EQ(reply.status.rc, expected) << reply.status.message;
-    EXPECT_TRUE(reply.paths.empty() && reply.instances.empty());
-    std::ifstream file(root / ".cimrt/messages");
-    std::vector<std::string> lines;
-    for (std::string line; std::getline(file, line);)
-      if (const auto end = line.find("): "); end != std::string::npos)
-        lines.push_back(line.substr(end + 3));
-    return lines;
-  }
-};
+using Traced = Traced_Library;
 
 TEST_F(Traced, AnUnknownSourceClassIsAnErrorInTheLogAlone) {
   host::Request request;
@@ -213,15 +185,18 @@ TEST_F(Traced, AnUnknownSourceClassIsAnErrorInTheLogAlone) {
   request.assocClass = request.resultClass = "TVXHBA_ControlledBy";
   EXPECT_EQ(broker->enumerateInstanceNames("TVXHBA_ControlledBy").status.rc, CMPI_RC_OK);
   const std::pair<host::Operation, const char*> rows[] = {
-      {host::Operation::Associators, "return: associators(): CMPI_RC_OK"},
-      {host::Operation::AssociatorNames, "return: associatorNames(): CMPI_RC_ERR_INVALID_CLASS"},
-      {host::Operation::References, "return: references(): CMPI_RC_ERR_INVALID_CLASS"},
-      {host::Operation::ReferenceNames, "return: referenceNames(): CMPI_RC_ERR_INVALID_CLASS"}};
+      {host::Operation::Associators, "DBG: return: associators(): CMPI_RC_OK"},
+      {host::Operation::AssociatorNames,
+       "DBG: return: associatorNames(): CMPI_RC_ERR_INVALID_CLASS"},
+      {host::Operation::References, "DBG: return: references(): CMPI_RC_ERR_INVALID_CLASS"},
+      {host::Operation::ReferenceNames,
+       "DBG: return: referenceNames(): CMPI_RC_ERR_INVALID_CLASS"}};
   for (const auto& [operation, line] : rows) {
     request.operation = operation;
     const auto lines = linesOf([&] { return broker->run(request); }, CMPI_RC_OK);
     ASSERT_FALSE(lines.empty()) << line;
     EXPECT_EQ(lines.back(), line);
+    EXPECT_TRUE(last.paths.empty() && last.instances.empty());
   }
 }
 
@@ -231,24 +206,27 @@ TEST_F(Traced, EveryOperationTellsItsBeginAndItsEnd) {
   nobody.keys.set("Tag", host::Value::string("nobody"));
   const host::Instance sent{card, {}};
   using Lines = std::vector<std::string>;
-  EXPECT_EQ(linesOf([&] { return broker->getInstance(nobody); }, CMPI_RC_ERR_NOT_FOUND),
-            (Lines{"enter: getInstance()", "return: getInstance(): CMPI_RC_ERR_NOT_FOUND"}));
   EXPECT_EQ(
-      linesOf([&] { return broker->createInstance(sent); }, CMPI_RC_ERR_NOT_SUPPORTED),
-      (Lines{"enter: createInstance()", "return: createInstance(): CMPI_RC_ERR_NOT_SUPPORTED"}));
+      linesOf([&] { return broker->getInstance(nobody); }, CMPI_RC_ERR_NOT_FOUND),
+      (Lines{"DBG: enter: getInstance()", "DBG: return: getInstance(): CMPI_RC_ERR_NOT_FOUND"}));
+  EXPECT_EQ(linesOf([&] { return broker->createInstance(sent); }, CMPI_RC_ERR_NOT_SUPPORTED),
+            (Lines{"DBG: enter: createInstance()",
+                   "DBG: return: createInstance(): CMPI_RC_ERR_NOT_SUPPORTED"}));
+  EXPECT_EQ(linesOf([&] { return broker->modifyInstance(sent); }, CMPI_RC_ERR_NOT_SUPPORTED),
+            (Lines{"DBG: enter: modifyInstance()",
+                   "DBG: return: modifyInstance(): CMPI_RC_ERR_NOT_SUPPORTED"}));
+  EXPECT_EQ(linesOf([&] { return broker->deleteInstance(card); }, CMPI_RC_ERR_NOT_SUPPORTED),
+            (Lines{"DBG: enter: deleteInstance()",
+                   "DBG: return: deleteInstance(): CMPI_RC_ERR_NOT_SUPPORTED"}));
   EXPECT_EQ(
-      linesOf([&] { return broker->modifyInstance(sent); }, CMPI_RC_ERR_NOT_SUPPORTED),
-      (Lines{"enter: modifyInstance()", "return: modifyInstance(): CMPI_RC_ERR_NOT_SUPPORTED"}));
-  EXPECT_EQ(
-      linesOf([&] { return broker->deleteInstance(card); }, CMPI_RC_ERR_NOT_SUPPORTED),
-      (Lines{"enter: deleteInstance()", "return: deleteInstance(): CMPI_RC_ERR_NOT_SUPPORTED"}));
-  EXPECT_EQ(linesOf([&] { return broker->execQuery("TVXHBA_Card", "q", "l"); },
-                    CMPI_RC_ERR_NOT_SUPPORTED),
-            (Lines{"enter: execQuery()", "return: execQuery(): CMPI_RC_ERR_NOT_SUPPORTED"}));
+      linesOf([&] { return broker->execQuery("TVXHBA_Card", "q", "l"); },
+              CMPI_RC_ERR_NOT_SUPPORTED),
+      (Lines{"DBG: enter: execQuery()", "DBG: return: execQuery(): CMPI_RC_ERR_NOT_SUPPORTED"}));
   broker->invokeMethod(card, "IsCompatible");
   EXPECT_EQ(
       linesOf([&] { return broker->invokeMethod(card, "Fly"); }, CMPI_RC_ERR_METHOD_NOT_FOUND),
-      (Lines{"enter: invokeMethod()", "return: invokeMethod(): CMPI_RC_ERR_METHOD_NOT_FOUND Fly"}));
+      (Lines{"DBG: enter: invokeMethod()",
+             "DBG: return: invokeMethod(): CMPI_RC_ERR_METHOD_NOT_FOUND Fly"}));
 }
 
 std::size_t openFiles() {
