@@ -76,8 +76,8 @@ class Context_Guard {
   std::unique_ptr<CMPI_Thread_Context> _context;
 };
 
-/// Logs the return line of an operation.
-void log_return(const char* function, const Outcome& outcome);
+/// Logs the return line of an operation; one that there is no memory for is lost.
+void log_return(const char* function, const Outcome& outcome) noexcept;
 
 /// The static data behind a management interface.
 template <class MI>

@@ -1,5 +1,7 @@
 // Providers that throw, whatever and wherever: the server gets a failure, the class serves on, and
 // nothing is lost.
+#include <set>
+
 #include "Built_Fixture.h"
 #include "Library_Blocks.h"
 
@@ -66,6 +68,38 @@ TEST_F(Exceptions, EndMethodsAsFailures) {
          "set Ostring=o; set OPart=TEST_Part(Id=q); break " + kind);
     expect_failure(wish, "invokeMethod", kind);
   }
+}
+
+TEST_F(Exceptions, OfMissingMemoryEndMethodsWithTheNameOfWhatCouldNotBeMade) {
+  Request wish = request(Call::InvokeMethod, path("TEST_All", "x"));
+  wish.method = "Run";
+  wish.arguments = {{"IPart", Any::reference(path("TEST_Part", "p"))}};
+  play("TEST_All", OPERATION_INVOKE_METHOD, "0");
+  EXPECT_EQ(run(wish).status.rc, CMPI_RC_OK);
+  std::set<std::string> endings;
+  std::set<std::string> warnings;
+  bool failed = true;
+  for (long number = 0; failed; ++number) {
+    const Trace_Log log;
+    const std::size_t before = Library_Blocks::live();
+    Library_Blocks::fail_after(number);
+    const Reply reply = broker.run(wish);
+    failed = Library_Blocks::stop();
+    control->asked();
+    // Once the results are told to be complete, a line of the log that is lost changes nothing.
+    EXPECT_EQ(reply.status.rc, reply.done ? CMPI_RC_OK : CMPI_RC_ERR_FAILED) << number;
+    EXPECT_TRUE(reply.done || failed) << number;
+    EXPECT_FALSE(reply.report.leaks());
+    EXPECT_LE(Library_Blocks::live(), before + 1) << number << ": more than the note was lost";
+    endings.insert(log.texts("DBG").empty() ? "" : log.texts("DBG").back());
+    for (const std::string& text : log.texts("WARN")) warnings.insert(text);
+    ASSERT_LT(number, 1000);
+  }
+  EXPECT_THAT(endings, Contains("return: invokeMethod(): CMPI_RC_ERR_FAILED CIMRT reference "
+                                "creation failed"));
+  EXPECT_THAT(endings, Contains("return: invokeMethod(): CMPI_RC_ERR_FAILED CIMRT "
+                                "make_cimrt_method function failed"));
+  EXPECT_THAT(warnings, Contains("failed to create CIMRT instance"));
 }
 
 TEST_F(Exceptions, EndWalksAsFailures) {

@@ -14,6 +14,15 @@ std::atomic<std::uintptr_t> code_begin{0};
 std::atomic<std::uintptr_t> code_end{0};
 std::atomic<std::size_t> live_blocks{0};
 
+thread_local long left = -1;  // until one fails; negative: none does
+thread_local bool failed = false;
+
+bool fails() {
+  if (left < 0 || left-- > 0) return false;
+  failed = true;
+  return true;
+}
+
 /// Stands before every block.
 struct alignas(std::max_align_t) Head {
   bool counted;
@@ -43,6 +52,16 @@ bool Library_Blocks::watch(const char* library) {
   return dl_iterate_phdr(take_code, const_cast<char*>(library)) != 0 && code_begin < code_end;
 }
 
+void Library_Blocks::fail_after(long number) {
+  failed = false;
+  left = number;
+}
+
+bool Library_Blocks::stop() {
+  left = -1;
+  return failed;
+}
+
 std::size_t Library_Blocks::live() {
   return live_blocks;
 }
@@ -52,9 +71,10 @@ std::size_t Library_Blocks::live() {
 // The program's own; the library's calls come here as well.
 
 void* operator new(std::size_t size) {
-  auto* head = static_cast<Head*>(std::malloc(sizeof(Head) + size));
+  const bool counted = asked_by_library(__builtin_return_address(0));
+  auto* head = counted && fails() ? nullptr : static_cast<Head*>(std::malloc(sizeof(Head) + size));
   if (!head) throw std::bad_alloc();
-  head->counted = asked_by_library(__builtin_return_address(0));
+  head->counted = counted;
   if (head->counted) ++live_blocks;
   return head + 1;
 }

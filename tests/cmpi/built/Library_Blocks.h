@@ -10,6 +10,11 @@ struct Library_Blocks {
   /// Takes the place of a loaded library's code, in place of one before it; false if it is not
   /// loaded.
   static bool watch(const char* library);
+  /// Lets `number` blocks that the library asks for on the calling thread come, and the next one
+  /// fail.
+  static void fail_after(long number);
+  /// No further one fails. True if one did.
+  static bool stop();
   /// Blocks that were not given back, of all libraries that were watched.
   static std::size_t live();
 };

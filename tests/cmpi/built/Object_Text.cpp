@@ -47,6 +47,7 @@ class Reader {
     Value value;
     read(feature_type(found), value);
     if (value.set(instance, found) != 0) refuse("a value that does not fit", name);
+    if (std::uint8_t* flag = null_flag(instance, found)) *flag = 0;
   }
 
  private:
@@ -66,6 +67,12 @@ class Reader {
       case STRING:
         value.set(String(until(",)").c_str()));
         break;
+      case STRING_ARRAY:
+        texts(value);
+        break;
+      case INSTANCE_ARRAY:
+        instances(value);
+        break;
       case DATETIME:
         value.set(Datetime(until(",)").c_str()));
         break;
@@ -78,6 +85,33 @@ class Reader {
       default:
         integer(type, value);
     }
+  }
+
+  /// Reads "{one, two}" with `read` for each element.
+  template <class Read>
+  void elements(Read&& read) {
+    next();
+    while (!_text.empty() && _text.front() != '}') {
+      read();
+      if (_text.starts_with(", ")) _text.remove_prefix(2);
+    }
+    next();
+  }
+
+  void texts(Value& value) {
+    Array<String> list;
+    elements([&] { list.append(String(until(",}").c_str())); });
+    value.set(list);
+  }
+
+  void instances(Value& value) {
+    Array<Instance*> list;
+    elements([&] {
+      const bool null = _text.starts_with("null");
+      if (null) _text.remove_prefix(4);
+      list.append(null ? nullptr : object().release());
+    });
+    value.set(list);
   }
 
   void integer(Type type, Value& value) {

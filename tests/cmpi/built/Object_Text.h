@@ -9,8 +9,9 @@
 namespace cimrt::test {
 
 /// An instance with the features that the text names; all others are null. A namespace may stand
-/// before the class, with a colon between them. Values are texts, numbers, truths, times and nested
-/// instances. Throws std::logic_error for any other text.
+/// before the class, with a colon between them. Values are texts, numbers, truths, times, nested
+/// instances, and in braces lists of texts and of instances. Throws std::logic_error for any other
+/// text.
 Ref<Instance> object_of(std::string_view text);
 
 /// Makes every feature null, lists of references too.

@@ -1,7 +1,6 @@
 // Associations through the built library, and where the four operations differ: in what they log,
 // in what they answer, and in what of a result's failure they let through.
-#include "Built_Fixture.h"
-#include "Faulty_Broker.h"
+#include "Failing_Server.h"
 
 namespace cimrt::test {
 namespace {
@@ -19,7 +18,7 @@ const std::pair<Call, const char*> calls[] = {{Call::Associators, "associators"}
                                               {Call::References, "references"},
                                               {Call::ReferenceNames, "referenceNames"}};
 
-class Built_Walks : public Built_Bridge {
+class Built_Walks : public Failing_Server {
  protected:
   Built_Walks() {
     play("TEST_Link", OPERATION_ENUM_INSTANCES, std::string(LINK_1) + "; " + LINK_2);
@@ -62,13 +61,13 @@ TEST_F(Built_Walks, InstanceOperationsFailWithAnUnknownClassAndLogItSo) {
   const CMPIInstanceMIFT& table = *face->ft;
   for (const auto& [call, name] : rows) {
     const Trace_Log log;
-    Straight_Call straight(broker);
-    const CMPIObjectPath* unknown = straight.path(path("TEST_Unknown", "a"));
-    const CMPIInstance* sent = tvx::host::makeInstance(
-        straight.core, {path("TEST_Unknown", "a"), {}}, tvx::host::Origin::HandedOut);
+    Straight_Call direct(broker);
+    const CMPIObjectPath* unknown = direct.path(path("TEST_Unknown", "a"));
+    const CMPIInstance* sent = tvx::host::makeInstance(direct.core, {path("TEST_Unknown", "a"), {}},
+                                                       tvx::host::Origin::HandedOut);
     const auto ask = [&]() -> CMPIStatus {
-      CMPIContext* context = straight.context;
-      CMPIResult* result = straight.result;
+      CMPIContext* context = direct.context;
+      CMPIResult* result = direct.result;
       switch (call) {
         case Call::EnumerateInstanceNames:
           return table.enumerateInstanceNames(face, context, result, unknown);
@@ -87,7 +86,7 @@ TEST_F(Built_Walks, InstanceOperationsFailWithAnUnknownClassAndLogItSo) {
     const CMPIStatus status = ask();
     EXPECT_EQ(status.rc, CMPI_RC_ERR_FAILED) << name;
     EXPECT_EQ(status.msg, nullptr) << name;
-    EXPECT_FALSE(straight.reply.done) << name;
+    EXPECT_FALSE(direct.reply.done) << name;
     const std::string start = std::string(name) + "()";
     EXPECT_THAT(log.lines(),
                 ElementsAre(Log_Line{"DBG", "enter: " + start},
@@ -98,11 +97,11 @@ TEST_F(Built_Walks, InstanceOperationsFailWithAnUnknownClassAndLogItSo) {
 TEST_F(Built_Walks, AMethodOfAnUnknownClassSaysWhatWasNotFound) {
   auto* face = static_cast<CMPIMethodMI*>(broker.interface("TEST_All", InterfaceKind::Method));
   const Trace_Log log;
-  Straight_Call straight(broker);
-  CMPIArgs* none = tvx::host::makeArgs(straight.core, {}, tvx::host::Origin::HandedOut);
+  Straight_Call direct(broker);
+  CMPIArgs* none = tvx::host::makeArgs(direct.core, {}, tvx::host::Origin::HandedOut);
   const CMPIStatus status =
-      face->ft->invokeMethod(face, straight.context, straight.result,
-                             straight.path(path("TEST_Unknown", "a")), "Run", none, none);
+      face->ft->invokeMethod(face, direct.context, direct.result,
+                             direct.path(path("TEST_Unknown", "a")), "Run", none, none);
   EXPECT_EQ(status.rc, CMPI_RC_ERR_FAILED);
   EXPECT_EQ(status.msg, nullptr);
   EXPECT_TRUE(log.has("DBG", "return: invokeMethod(): CMPI_RC_ERR_FAILED MetaClass not found"));
@@ -111,13 +110,13 @@ TEST_F(Built_Walks, AMethodOfAnUnknownClassSaysWhatWasNotFound) {
 TEST_F(Built_Walks, AnotherClassOfTheSchemaIsAcceptedByEveryInterface) {
   play("TEST_Part", OPERATION_ENUM_INSTANCES, "echo");
   auto* face = static_cast<CMPIInstanceMI*>(broker.interface("TEST_Part", InterfaceKind::Instance));
-  Straight_Call straight(broker);
+  Straight_Call direct(broker);
   const CMPIStatus status = face->ft->enumerateInstanceNames(
-      face, straight.context, straight.result, straight.path({"", NAME_SPACE, "test_SPARE", {}}));
+      face, direct.context, direct.result, direct.path({"", NAME_SPACE, "test_SPARE", {}}));
   EXPECT_EQ(status.rc, CMPI_RC_OK);
   EXPECT_STREQ(control->asked(), "enumerate TEST_Spare()\nwanted\n");
-  ASSERT_EQ(straight.reply.paths.size(), 1U);
-  EXPECT_EQ(straight.reply.paths[0].className, "TEST_Spare");
+  ASSERT_EQ(direct.reply.paths.size(), 1U);
+  EXPECT_EQ(direct.reply.paths[0].className, "TEST_Spare");
 }
 
 TEST_F(Built_Walks, AClassThatIsNoAssociationFailsWithoutAnEnumeration) {
@@ -171,16 +170,16 @@ TEST_F(Built_Walks, FiltersThatAreNullAndEmptyAreTheSame) {
   auto* face =
       static_cast<CMPIAssociationMI*>(broker.interface("TEST_Link", InterfaceKind::Association));
   for (const char* filter : {static_cast<const char*>(nullptr), ""}) {
-    Straight_Call straight(broker);
-    const CMPIObjectPath* from = straight.path(source);
+    Straight_Call direct(broker);
+    const CMPIObjectPath* from = direct.path(source);
     EXPECT_EQ(face->ft
-                  ->associatorNames(face, straight.context, straight.result, from, filter, filter,
+                  ->associatorNames(face, direct.context, direct.result, from, filter, filter,
                                     filter, filter)
                   .rc,
               CMPI_RC_OK);
     EXPECT_STREQ(control->asked(), "names TEST_Element(Id=\"e\") //\n");
     EXPECT_EQ(
-        face->ft->referenceNames(face, straight.context, straight.result, from, filter, filter).rc,
+        face->ft->referenceNames(face, direct.context, direct.result, from, filter, filter).rc,
         CMPI_RC_OK);
     EXPECT_STREQ(control->asked(), "references TEST_Element(Id=\"e\") TEST_Link() \n");
   }
@@ -257,36 +256,10 @@ TEST_F(Built_Walks, ThreeEndsGiveTwoFarOnes) {
 
 // ---- Results that cannot be made
 
-/// The adapter of a class on a server that fails on demand.
-class Failing_Server : public Built_Walks {
- protected:
-  ~Failing_Server() override {
-    for (const auto& give_back : _held) give_back();
-  }
-  void put_before(const char* class_name, char letter) {
-    void* face = control->interface(class_name, faulty.face(), straight.context, letter);
-    _held.push_back([this, face, letter] {
-      if (letter == 'A') {
-        auto* mi = static_cast<CMPIAssociationMI*>(face);
-        mi->ft->cleanup(mi, straight.context, 1);
-      } else {
-        auto* mi = static_cast<CMPIInstanceMI*>(face);
-        mi->ft->cleanup(mi, straight.context, 1);
-      }
-    });
-  }
-
-  Faulty_Broker faulty{broker.face()};
-  Straight_Call straight{broker};
-
- private:
-  std::vector<std::function<void()>> _held;
-};
-
-TEST_F(Failing_Server, NamesEndTheirDeliveryWhereInstancesPassOver) {
+TEST_F(Built_Walks, NamesEndTheirDeliveryWhereInstancesPassOver) {
   play("TEST_Part", OPERATION_ENUM_INSTANCES,
        "deliver TEST_Part(Id=a); deliver TEST_Part(Id=b); deliver TEST_Part(Id=c)");
-  put_before("TEST_Part", 'I');
+  put_before("TEST_Part");
   const struct {
     Call call;
     const char* name;
@@ -306,8 +279,8 @@ TEST_F(Failing_Server, NamesEndTheirDeliveryWhereInstancesPassOver) {
   }
 }
 
-TEST_F(Failing_Server, AWalkThatCannotMakeAResultIsASuccess) {
-  put_before("TEST_Link", 'A');
+TEST_F(Built_Walks, AWalkThatCannotMakeAResultIsASuccess) {
+  put_before<CMPIAssociationMI>("TEST_Link", 'A', faulty.face());
   for (const auto& [call, name] : calls) {
     faulty.fail("newObjectPath", 1);
     control->asked();
@@ -324,8 +297,8 @@ TEST_F(Failing_Server, AWalkThatCannotMakeAResultIsASuccess) {
   }
 }
 
-TEST_F(Failing_Server, OwnAnswersOfAProviderHearOfAFailureInTheNamesAlone) {
-  put_before("TEST_Link", 'A');
+TEST_F(Built_Walks, OwnAnswersOfAProviderHearOfAFailureInTheNamesAlone) {
+  put_before<CMPIAssociationMI>("TEST_Link", 'A', faulty.face());
   const std::string parts = "deliver root/test:TEST_Part(Id=a); deliver root/test:TEST_Part(Id=b)";
   play("TEST_Link", OPERATION_ENUM_ASSOCIATOR_NAMES, parts);
   play("TEST_Link", OPERATION_ENUM_ASSOCIATORS, parts);
@@ -344,8 +317,8 @@ TEST_F(Failing_Server, OwnAnswersOfAProviderHearOfAFailureInTheNamesAlone) {
   }
 }
 
-TEST_F(Failing_Server, TheCodeOfAConversionIsAnswered) {
-  put_before("TEST_Part", 'I');
+TEST_F(Built_Walks, TheCodeOfAConversionIsAnswered) {
+  put_before("TEST_Part");
   play("TEST_Part", OPERATION_GET_INSTANCE, "out TEST_Part(Id=a)");
   play("TEST_Part", OPERATION_CREATE_INSTANCE, "0");
   const auto expect_failed = [&](Call call, const char* function, const char* name) {
@@ -380,20 +353,18 @@ CMPIInstance* unfilterable(const CMPIBroker*, const CMPIObjectPath*, CMPIStatus*
   return &target;
 }
 
-TEST_F(Failing_Server, ACodeWithoutANameIsAnsweredAsItIsAndLoggedAsAFailure) {
+TEST_F(Built_Walks, ACodeWithoutANameIsAnsweredAsItIsAndLoggedAsAFailure) {
   CMPIBrokerEncFT makers = *faulty.face()->eft;
   makers.newInstance = &unfilterable;
   CMPIBroker face = *faulty.face();
   face.eft = &makers;
-  auto* mi =
-      static_cast<CMPIInstanceMI*>(control->interface("TEST_Part", &face, straight.context, 'I'));
+  put_before<CMPIInstanceMI>("TEST_Part", 'I', &face);
   play("TEST_Part", OPERATION_GET_INSTANCE, "out TEST_Part(Id=a)");
   Request wish = request(Call::GetInstance, path("TEST_Part", "a"));
   wish.properties = {{"Size"}};
   const Trace_Log log;
   EXPECT_EQ(broker.run(wish).status.rc, 99);
   EXPECT_TRUE(log.has("DBG", "return: getInstance(): CMPI_RC_ERR_FAILED"));
-  mi->ft->cleanup(mi, straight.context, 1);
 }
 
 }  // namespace
