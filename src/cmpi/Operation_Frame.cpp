@@ -51,14 +51,16 @@ Context_Guard::~Context_Guard() {
   Thread_Context::pop();
 }
 
-void log_return(const char* function, const Outcome& outcome) noexcept try {
+void log_return(const char* function, const Outcome& outcome) noexcept {
   const char* code = name_of_code(outcome.logged);
-  if (outcome.detail)
-    CIMRT_TRACE(LOG_DBG_, "return: %s(): %s %s", function, code, outcome.detail->c_str());
-  else
-    CIMRT_TRACE(LOG_DBG_, "return: %s(): %s", function, code);
-} catch (...) {
-  // The server's answer stands without it.
+  try {
+    if (outcome.detail)
+      CIMRT_TRACE(LOG_DBG_, "return: %s(): %s %s", function, code, outcome.detail->c_str());
+    else
+      CIMRT_TRACE(LOG_DBG_, "return: %s(): %s", function, code);
+  } catch (...) {
+    // The server's answer stands without the line.
+  }
 }
 
 }  // namespace cimrt

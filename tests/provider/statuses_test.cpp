@@ -1,10 +1,14 @@
 // What the providers of the library answer, as the server gets it and as the trace log tells it:
 // every status that one of them has, and what of a request is left out with no more than a line.
+#include <dlfcn.h>
+
 #include <fstream>
+#include <map>
 #include <sstream>
 
 #include "Failing_Allocations.h"
 #include "Traced_Library.h"
+#include "runtime/Provider_Operations.h"
 #include "tvxsim/tvxsim.h"
 
 namespace tvx::test {
@@ -234,7 +238,44 @@ TEST_F(Statuses, ArgumentsThatDoNotFitAreToldAndTextsAreRead) {
              "WARN: unexpected failure: InstallFromByteStream.Image"}));
 }
 
-// ---- Names of the tables
+// ---- Dispatchers, and names of the tables
+
+std::int32_t ask(const cimrt::Registration* entry, std::uint32_t operation, void* place = nullptr) {
+  return entry->provider_proc(entry, operation, place, nullptr, nullptr, nullptr, nullptr, nullptr,
+                              nullptr, nullptr);
+}
+
+TEST_F(Statuses, OperationsThatADispatcherDoesNotHaveAnswerMinusOne) {
+  void* library = dlopen(TVX_PROVIDER_LIBRARY, RTLD_NOW | RTLD_NOLOAD);
+  ASSERT_NE(library, nullptr);
+  using Module = const cimrt::Registration* (*)();
+  std::map<std::string, std::size_t> shapes;
+  const auto* entry = reinterpret_cast<Module>(dlsym(library, "cimrt_module"))();
+  for (; entry; entry = entry->next) {
+    const std::string name = entry->provider_name;
+    const host::ClassData* each = classes->find(name.substr(0, name.size() - 9));
+    ASSERT_NE(each, nullptr) << name;
+    const cimrt::Meta_Class* served = nullptr;
+    EXPECT_EQ(ask(entry, cimrt::OPERATION_GET_META_CLASS, &served), 0) << name;
+    EXPECT_EQ(served, entry->meta_class) << name;
+    const cimrt::Meta_Repository* repository = nullptr;
+    EXPECT_EQ(ask(entry, cimrt::OPERATION_GET_REPOSITORY, &repository), 0) << name;
+    EXPECT_NE(repository, nullptr) << name;
+    for (const std::uint32_t operation : {11U, 12U, 17U, 99U, ~0U})
+      EXPECT_EQ(ask(entry, operation), -1) << name << " " << operation;
+    if (each->methodCount == 0) {
+      EXPECT_EQ(ask(entry, cimrt::OPERATION_INVOKE_METHOD), -1) << name;
+    }
+    if (!each->isAssociation) {
+      for (const std::uint32_t operation : {14U, 15U, 16U})
+        EXPECT_EQ(ask(entry, operation), -1) << name << " " << operation;
+    }
+    ++shapes[each->isAssociation ? "association" : each->methodCount ? "with methods" : "plain"];
+  }
+  EXPECT_EQ(shapes, (std::map<std::string, std::size_t>{
+                        {"association", 100}, {"with methods", 30}, {"plain", 22}}));
+  dlclose(library);
+}
 
 TEST_F(Statuses, OnlyTheInstanceTableOfAClassHasAName) {
   for (const std::string& name : servedClasses()) {
