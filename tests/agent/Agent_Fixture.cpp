@@ -25,6 +25,9 @@ std::uint64_t testClock() {
 constexpr std::uint64_t START_OF_TIME = 1'700'000'000'000'000;
 constexpr std::uint64_t PAUSE = 3'600'000'000;
 
+constexpr const char* RUN_BEGIN = "PERF: DataFetch_Handler Thread BEGIN";
+constexpr const char* RUN_END = "PERF: DataFetch_Handler Thread END";
+
 /// Each test starts later than all before it: the throttles of the live updates are the process's.
 std::uint64_t nextStart() {
   static std::uint64_t start = START_OF_TIME;
@@ -122,13 +125,15 @@ void Agent_Test::refresh(ProviderAgent& agent) {
 }
 
 void Agent_Test::awaitIdle(ProviderAgent& agent) {
-  for (;;) {
-    {
-      Ranked_Lock lock(agent.m_ThreadMutex);
-      if (!agent.m_bThreadRunning) return;
-    }
-    std::this_thread::sleep_for(std::chrono::milliseconds(1));
-  }
+  const auto pause = [] { std::this_thread::sleep_for(std::chrono::milliseconds(1)); };
+  const auto isRunning = [&agent] {
+    Ranked_Lock lock(agent.m_ThreadMutex);
+    return agent.m_bThreadRunning;
+  };
+  while (isRunning()) pause();
+  // Its last word comes after that; a test that reads the log must not meet it later.
+  constexpr int PATIENCE = 2000;
+  for (int i = 0; i < PATIENCE && log.count(RUN_BEGIN) > log.count(RUN_END); i++) pause();
 }
 
 void Agent_Test::writeFile(const std::string& path, const std::string& text) {

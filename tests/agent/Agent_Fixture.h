@@ -55,7 +55,7 @@ class Agent_Test : public ::testing::Test {
   void stopAgent();
   /// Runs refreshes until the adapter maps are ready, and waits for the thread to end.
   void refresh(ProviderAgent& agent);
-  /// Waits until no refresh thread runs.
+  /// Waits until no refresh thread runs, and the last one has logged its end.
   void awaitIdle(ProviderAgent& agent);
   /// Writes a file under the root folder.
   void writeFile(const std::string& path, const std::string& text);
