@@ -1,4 +1,5 @@
 // The three forms of enumeration: what is delivered, when, and with which locks.
+#include <atomic>
 #include <stdexcept>
 #include <string>
 #include <thread>
@@ -105,6 +106,41 @@ TEST_F(Enumeration, DeliversWithEveryLockFree) {
   addVolume(agent, "one");
   agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, delivered.handler());
   EXPECT_TRUE(everyLockWasFree);
+}
+
+TEST_F(Enumeration, ReadersOfOneGroupCopyOneAfterTheOtherUnderTheDataLock) {
+  ProviderAgent& agent = readyAgent();
+  const struct {
+    void (*read)(ProviderAgent&, const Instance_Handler&);
+    Ranked_Mutex& group;
+  } forms[] = {{[](ProviderAgent& a, const Instance_Handler& handler) {
+                  a.enumInstances(a.m_TVXHBA_FCPort_map, handler);
+                },
+                agent.m_AdapterMapsReadyMutex},
+               {[](ProviderAgent& a, const Instance_Handler& handler) {
+                  a.enumSANInstances(a.m_TVXHBA_FCPort_map, handler);
+                },
+                agent.m_SANMapsReadyMutex}};
+  for (const auto& form : forms) {
+    Delivered first, second;
+    std::atomic<int> done{0};
+    Ranked_Lock data(agent.m_DataMutex);
+    std::thread one([&] {
+      form.read(agent, first.handler());
+      done++;
+    });
+    while (done == 0 && agent.m_DataMutex.waiting() == 0) std::this_thread::yield();
+    std::thread other([&] {
+      form.read(agent, second.handler());
+      done++;
+    });
+    while (done == 0 && form.group.waiting() == 0) std::this_thread::yield();
+    EXPECT_EQ(done, 0);
+    data.release();
+    one.join();
+    other.join();
+    EXPECT_EQ(first.size() + second.size(), 8u);
+  }
 }
 
 TEST_F(Enumeration, StopsWhenTheHandlerHasEnough) {
