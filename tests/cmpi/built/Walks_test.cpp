@@ -199,6 +199,30 @@ TEST_F(Built_Walks, AProvidersOwnAssociatorsAreConvertedWithAWarning) {
   EXPECT_EQ(control->count("TEST_Part", OPERATION_GET_INSTANCE), 0U);
 }
 
+TEST_F(Built_Walks, ReferencesDropTheKeysThatAreNotListedAndShowNullsWithoutAList) {
+  Request wish = request(Call::References, source);
+  wish.properties = {{"Note", "NoSuch"}};
+  const Reply listed = run(wish);
+  ASSERT_EQ(listed.instances.size(), 2U);
+  EXPECT_EQ(listed.instances[0].properties, (NamedValues{{"Note", Any::string("n")}}));
+  EXPECT_EQ(listed.instances[0].path.keys.size(), 2U);
+
+  play("TEST_Link", OPERATION_ENUM_INSTANCES,
+       "deliver TEST_Link(Antecedent=TEST_Element(Id=e), Dependent=TEST_Part(Id=p))");
+  const Reply whole = walk(Call::References, source);
+  ASSERT_EQ(whole.instances.size(), 1U);
+  EXPECT_EQ(whole.instances[0].property("Note"), Any::string("")) << "the provider left it null";
+}
+
+TEST_F(Built_Walks, AssociatorsAreAskedForWithTheListOfTheRequest) {
+  Request wish = request(Call::Associators, source);
+  wish.properties = {{"Size"}};
+  const Reply reply = run(wish);
+  ASSERT_EQ(reply.instances.size(), 2U);
+  EXPECT_FALSE(reply.instances[0].has("Caption"));
+  EXPECT_EQ(std::count(asked.begin(), asked.end(), "get TEST_Part(Id=\"p1\", Size=0)"), 1);
+}
+
 TEST_F(Built_Walks, NamespacesOfFarEndsWinOverTheRequestsAndThoseOfLinksDoNot) {
   play("TEST_Link", OPERATION_ENUM_INSTANCES,
        "deliver root/link:TEST_Link(Antecedent=TEST_Element(Id=e), "
