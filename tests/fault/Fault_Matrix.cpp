@@ -35,10 +35,11 @@
 #if defined(__SANITIZE_ADDRESS__)
 #include <sanitizer/lsan_interface.h>
 
-/// Short stacks of allocations: to keep the long ones takes a fifth of the time.
+/// Short stacks of allocations and a small store of freed memory: they take a third of the time
+/// otherwise. To look into a finding, run its row with ASAN_OPTIONS=malloc_context_size=30.
 extern "C" const char* __asan_default_options();
 extern "C" const char* __asan_default_options() {
-  return "malloc_context_size=6";
+  return "malloc_context_size=1:quarantine_size_mb=24";
 }
 #endif
 

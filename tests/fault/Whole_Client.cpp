@@ -56,7 +56,8 @@ void Whole_Client::readEverything() {
 
 void Whole_Client::readInstances() {
   for (const ClassData* each : m_Classes.all())
-    if (each->isServed) readInstancesOf(*each);
+    if (each->isServed)
+      count(m_Broker.enumerateInstances(each->name), std::string("instances of ") + each->name);
 }
 
 const ObjectPath* Whole_Client::firstOf(const std::string& className) {

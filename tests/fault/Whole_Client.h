@@ -44,7 +44,7 @@ class Whole_Client {
   void readClass(const host::ClassData& classData);
   /// The same of every class.
   void readEverything();
-  /// Names and instances of every class, and one of each by its path.
+  /// The instances of every class.
   void readInstances();
   /// Every method of every class, without arguments; then the purposeful calls.
   void callEverything();
