@@ -83,7 +83,7 @@ class Firmware : public Provider_Test {
   /// True once it holds. A refresh that a method asked for runs in the background: it has files
   /// open for a moment, and readers that come before it has begun get the cache as it was.
   static bool soon(const std::function<bool()>& holds) {
-    for (int tries = 0; tries < 1000 && !holds(); tries++)
+    for (int tries = 0; tries < 10'000 && !holds(); tries++)
       std::this_thread::sleep_for(std::chrono::milliseconds(2));
     return holds();
   }
