@@ -3,6 +3,7 @@
 #include <chrono>
 #include <string>
 #include <thread>
+#include <vector>
 
 #include "Provider_Fixture.h"
 
@@ -70,6 +71,17 @@ class Diagnostics : public Provider_Test {
     return counts.isNull() ? "(null)" : counts.asTextList().at(0);
   }
   std::size_t count(const char* className) { return instances(className).size(); }
+  /// The InstanceIDs of what an association leads to, in alphabetical order.
+  std::vector<std::string> behind(const host::ObjectPath& path, const char* association,
+                                  const char* property = "InstanceID") {
+    const host::Reply found = broker->associators(path, association);
+    EXPECT_EQ(found.status.rc, CMPI_RC_OK) << association << ": " << found.status.message;
+    EXPECT_FALSE(found.report.leaks()) << found.report.text();
+    std::vector<std::string> texts;
+    for (const host::Instance& each : found.instances) texts.push_back(each.text(property));
+    std::sort(texts.begin(), texts.end());
+    return texts;
+  }
 
   host::Reply reply;
 };
@@ -101,6 +113,30 @@ TEST_F(Diagnostics, ARunLeavesItsJobAndRecords) {
   EXPECT_EQ(count("TVXHBA_DiagnosticServiceRecord"), 1u);
   EXPECT_EQ(count("TVXHBA_OwningJobElement"), 1u);
   EXPECT_EQ(count("TVXHBA_AffectedJobElement"), 1u);
+}
+
+TEST_F(Diagnostics, ResultsAreFoundFromTheLogThePortAndTheJob) {
+  using Texts = std::vector<std::string>;
+  ASSERT_EQ(run(STATUS_TEST), 0u);
+  ASSERT_EQ(run(HOST_TEST, cycles("7")), 0u);
+  const host::ObjectPath job = one("TVXHBA_ConcreteJob", "Name", HOST_TEST).path;
+  const std::string id = job.key("InstanceID").asText();
+  const Texts all = {id, id + ":Service Record", id + ":SettingData Record"};
+  EXPECT_EQ(
+      behind(one("TVXHBA_DiagnosticsLog", "InstanceID", HOST_TEST).path, "TVXHBA_LogManagesRecord"),
+      all);
+  const Texts ofThePort =
+      behind(one("TVXHBA_PortController", "DeviceID", PORT).path, "TVXHBA_RecordAppliesToElement");
+  EXPECT_EQ(ofThePort.size(), 2u + 3u) << "of both runs";
+  EXPECT_TRUE(std::includes(ofThePort.begin(), ofThePort.end(), all.begin(), all.end()));
+  EXPECT_EQ(behind(job, "TVXHBA_OwningJobElement", "Name"), Texts{HOST_TEST});
+  EXPECT_EQ(behind(job, "TVXHBA_AffectedJobElement", "DeviceID"), Texts{PORT});
+  const host::Instance settings = one("TVXHBA_DiagnosticSettingDataRecord", "Caption", id);
+  EXPECT_EQ(behind(settings.path, "TVXHBA_CorrespondingSettingDataRecord"),
+            (Texts{id, id + ":Service Record"}));
+  const host::Instance& used = settings.property("Settings").asInstance();
+  EXPECT_EQ(used.text("InstanceID"), HOST_TEST);
+  EXPECT_EQ(used.property("LoopControlParameter").asTextList(), Texts{"7"});
 }
 
 TEST_F(Diagnostics, ClearingALogTakesTheRecordsOfItsTest) {
