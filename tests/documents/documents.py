@@ -4,7 +4,7 @@ from dataclasses import dataclass, field
 from pathlib import Path
 
 COMMANDS = ("console", "sh")  # languages of blocks that are commands
-OTHERS = ("text", "mof", "json")  # what a block may hold besides
+OTHERS = ("text", "mof", "json", "cpp")  # what a block may hold besides
 COMMAND_LIKE = re.compile(r"\$ |(scripts/\w+\.sh|tvxcim|wbemcli|torvex-fc-register|cmake|ctest|ninja|python3|apt|source)( |$)")
 FENCE = re.compile(r"^(\s*)```(\S*)\s*$")
 
