@@ -37,7 +37,7 @@ class ServedProgram {
   }
   ~ServedProgram() {
     if (m_Process > 0) {
-      end();
+      EXPECT_EQ(end(), 0) << "a signal, a sanitizer or a leak ended it";
     }
     if (m_Output != nullptr) {
       fclose(m_Output);
