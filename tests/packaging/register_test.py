@@ -32,9 +32,10 @@ class RegisterTest(unittest.TestCase):
             path.write_text(f'#!/bin/sh\necho "{name} $*" >>"{self.log}"\nexit {status}\n')
             path.chmod(0o755)
 
-    def run_program(self, *words):
+    def run_program(self, *words, **environment):
         return subprocess.run(["/bin/sh", PROGRAM, "--data", str(self.folder / "data"), *words], text=True,
-                              capture_output=True, env={"PATH": str(self.folder / "bin")}, check=False)
+                              capture_output=True, check=False,
+                              env={"PATH": str(self.folder / "bin"), **environment})
 
     def logged(self):
         text = self.log.read_text() if self.log.exists() else ""
@@ -49,6 +50,24 @@ class RegisterTest(unittest.TestCase):
             "cimmof -w -aE -n root/pg_interop mof/torvex_fc_cim.mof",
             "cimmof -w -aE -n root/pg_interop mof/torvex_fc_interop.mof",
             "cimmof -n root/interop registration/torvex_fc_pegasus.mof"])
+
+    def test_commands_and_options_can_be_others(self):
+        self.tools(("my-mof", "my-provider", "my-stage", "my-unstage", "my-repos"))
+        names = {"CIMMOF": "my-mof", "CIMPROVIDER": "my-provider", "CIMMOF_OPTIONS": "", "SFCBSTAGE": "my-stage",
+                 "SFCBUNSTAGE": "my-unstage", "SFCBREPOS": "my-repos"}
+        for words in ([], ["unregister"], ["--server", "sfcb"], ["--server", "sfcb", "unregister"]):
+            self.assertEqual(self.run_program(*words, **names).returncode, 0)
+        self.assertEqual(self.logged()[0], "my-mof -n root/torvex mof/torvex_fc_cim.mof")
+        self.assertEqual({line.split()[0] for line in self.logged()},
+                         {"my-mof", "my-provider", "my-stage", "my-unstage", "my-repos"})
+        self.assertEqual(len(self.logged()), 5 + 2 + 3 + 3)
+
+    def test_schemas_are_looked_for_in_three_folders(self):
+        told = (Path(PROGRAM).parent / "torvex-fc-register.8").read_text().replace("\\-", "-")
+        script = Path(PROGRAM).read_text()
+        for folder in ("/usr/share/sfcb/CIM", "/usr/share/mof/cim-current", "/usr/local/share/sfcb/CIM"):
+            self.assertIn(folder, script)
+            self.assertIn(folder, told)
 
     def test_pegasus_loses_the_module(self):
         self.tools(PEGASUS)
