@@ -257,6 +257,46 @@ TEST(InstanceMap, KeyChangedFollowsAPointerThatWasKept) {
   EXPECT_EQ(map.find(make_device("a", 3).get()), Instance_Map_Base::npos);
 }
 
+TEST(InstanceMap, RemovingAnEntryKeepsThoseThatWereChangedBehindIt) {
+  Instance_Map<T_Device> map;
+  for (std::uint32_t i = 0; i < 10; ++i) map.insert(make_device("a", i).release());
+  EXPECT_EQ(map.find(make_device("a", 9).get()), 9u);
+  map[8]->Number.set(80u);  // to be checked again
+  EXPECT_EQ(map.delete_instance(make_device("a", 2).get()), 0);
+  map[7]->Number.set(81u);
+  EXPECT_EQ(map.find(make_device("a", 81).get()), 7u);
+  EXPECT_EQ(map.find(make_device("a", 80).get()), Instance_Map_Base::npos);
+  EXPECT_EQ(map.find(make_device("a", 9).get()), 8u);
+}
+
+TEST(InstanceMap, FindsByKeysThatAreRealsAndArrays) {
+  Meta_Class* mc = create_meta_class("X_Keys", nullptr, FLAG_CLASS);
+  add_feature(mc, create_property("Real", REAL32, 0, 24, true));
+  add_feature(mc, create_property("Numbers", UINT16, -1, 32, true));
+  const auto make_entry = [&](float real, std::initializer_list<std::uint16_t> numbers) {
+    Ref<Instance> instance(create(mc, true));
+    for (const char* name : {"Real", "Numbers"})
+      *null_flag(instance.get(), find_property(mc, name)) = 0;
+    *static_cast<float*>(storage(instance.get(), find_property(mc, "Real"))) = real;
+    auto& array =
+        *static_cast<Array<std::uint16_t>*>(storage(instance.get(), find_property(mc, "Numbers")));
+    for (const std::uint16_t number : numbers) array.append(number);
+    return instance;
+  };
+  {
+    Instance_Map_Base map(mc);
+    EXPECT_EQ(map.insert(make_entry(0.5F, {1, 2}).release()), 0u);
+    EXPECT_EQ(map.insert(make_entry(0.5F, {2, 1}).release()), 1u);
+    EXPECT_EQ(map.insert(make_entry(0.0F, {}).release()), 2u);
+    EXPECT_EQ(map.find(make_entry(0.5F, {2, 1}).get()), 1u);
+    EXPECT_EQ(map.find(make_entry(-0.0F, {}).get()), 2u) << "both zeros are one key";
+    EXPECT_EQ(map.find(make_entry(0.5F, {1}).get()), Instance_Map_Base::npos);
+    const Ref<Instance> again = make_entry(0.5F, {1, 2});
+    EXPECT_EQ(map.insert(again.get()), Instance_Map_Base::npos);
+  }
+  unref(mc);
+}
+
 TEST(InstanceMap, NeverAnswersAnEntryThatIsNotKeyEqual) {
   Instance_Map<T_Device> map;
   map.insert(make_device("a", 3).release());

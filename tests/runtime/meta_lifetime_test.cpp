@@ -214,6 +214,37 @@ TEST(RunTimeClass, IdenticalSeesEveryDifference) {
   EXPECT_FALSE(identical(&T_Device::static_meta_class, &T_Port::static_meta_class));
 }
 
+TEST(RunTimeClass, IdenticalComparesQualifiersMethodsAndReferences) {
+  const auto same_after = [](const Meta_Class* source, void (*change)(Meta_Class*)) {
+    Meta_Class* left = clone(source);
+    Meta_Class* right = clone(source);
+    add_qualifier(left, make_qualifier("Description", "text"));
+    add_qualifier(right, make_qualifier("description", "text"));
+    EXPECT_TRUE(identical(left, right)) << source->name;
+    change(right);
+    const bool same = identical(left, right);
+    unref(left);
+    unref(right);
+    return same;
+  };
+  EXPECT_FALSE(same_after(&T_Device::static_meta_class, [](Meta_Class* mc) {
+    const_cast<Meta_Qualifier*>(mc->meta_qualifiers[0])->type = DATETIME;
+  }));
+  EXPECT_FALSE(same_after(&T_Device::static_meta_class, [](Meta_Class* mc) {
+    add_qualifier(mc, make_qualifier("Version", "1"));
+  }));
+  EXPECT_FALSE(same_after(&T_Device::static_meta_class, [](Meta_Class* mc) {
+    for (std::uint64_t i = 0; i < mc->num_meta_features; ++i)
+      if (is_method(mc->meta_features[i]))
+        const_cast<Meta_Method*>(as_method(mc->meta_features[i]))->return_type = REAL64;
+  }));
+  EXPECT_FALSE(same_after(&T_Link::static_meta_class, [](Meta_Class* mc) {
+    auto* reference = const_cast<Meta_Reference*>(find_reference(mc, "Dependent"));
+    unref(reference->meta_class);
+    reference->meta_class = &T_Port::static_meta_class;
+  }));
+}
+
 TEST(ClassDump, ShowsTheClassItsFlagsAndItsMembers) {
   EXPECT_EQ(printed(&T_Port::static_meta_class, false),
             "class T_Port : T_Device\n"

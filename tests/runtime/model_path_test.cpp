@@ -3,6 +3,7 @@
 
 #include <random>
 #include <string>
+#include <utility>
 
 #include "Test_Schema.h"
 
@@ -61,6 +62,29 @@ TEST(WritePath, WritesEachTypeItsWay) {
   EXPECT_EQ(written(integers.get()),
             "T_Integers.Uint8=255,Sint16=-5,Uint64=18446744073709551615,"
             "Sint64=-9223372036854775808,Flag=false");
+}
+
+TEST(WritePath, WritesKeysOfClassesThatAreMadeAtRunTime) {
+  Meta_Class* mc = create_meta_class("X_Keys", nullptr, FLAG_CLASS);
+  const std::pair<const char*, Type> keys[] = {
+      {"Small", SINT8}, {"Short", UINT16}, {"Whole", SINT32}, {"Real", REAL32}};
+  std::uint32_t offset = 24;
+  for (const auto& [name, type] : keys) {
+    add_feature(mc, create_property(name, type, 0, offset, true));
+    offset += 8;
+  }
+  const Ref<Instance> instance(create(mc, true));
+  const auto value = [&](const char* name) {
+    *null_flag(instance.get(), find_property(mc, name)) = 0;
+    return storage(instance.get(), find_property(mc, name));
+  };
+  *static_cast<std::int8_t*>(value("Small")) = -128;
+  *static_cast<std::uint16_t*>(value("Short")) = 65535;
+  *static_cast<std::int32_t*>(value("Whole")) = INT32_MIN;
+  *static_cast<float*>(value("Real")) = 0.5F;
+  EXPECT_EQ(written(instance.get()),
+            "X_Keys.Small=-128,Short=65535,Whole=-2147483648,Real=0.500000");
+  unref(mc);
 }
 
 TEST(WritePath, RefusesKeylessClassesNullKeysAndArrayKeysAndLeavesTheText) {
