@@ -1,7 +1,7 @@
 #!/usr/bin/env bash
 # Builds with gcov's counters, runs all tests, and tells how much of the provider's own code they reach: lines and
-# branches of src/, generated code apart. The table by folder goes to build/coverage/coverage.md, pages with every
-# line to build/coverage/html/.
+# branches of src/, generated code apart. The table by folder goes to docs/reliability.md and to
+# build/coverage/coverage.md, pages with every line to build/coverage/html/.
 #
 # usage: scripts/coverage.sh [--no-run]     --no-run: report on what an earlier run counted
 set -euo pipefail
@@ -28,8 +28,8 @@ mkdir -p "$build/html"
 gcovr --root "$root" --object-directory "$build" --filter "$root/src/" --exclude-throw-branches \
   --exclude-unreachable-branches --gcov-ignore-parse-errors -j "$jobs" \
   --json-summary "$build/coverage.json" --html-details "$build/html/index.html" >/dev/null
-python3 - "$build/coverage.json" "$build/coverage.md" <<'PY'
-import json, sys, collections
+python3 - "$build/coverage.json" "$build/coverage.md" "$root/docs/reliability.md" <<'PY'
+import json, sys, collections, pathlib, re
 files = json.load(open(sys.argv[1]))["files"]
 sums = collections.defaultdict(lambda: [0, 0, 0, 0])
 for f in files:
@@ -45,4 +45,10 @@ for name in sorted(sums, key=lambda n: (n == "all", n)):
     lines.append("| `%s` | %d | %d | %s | %d | %d | %s |" % (name, a, b, percent(a, b), c, d, percent(c, d)))
 open(sys.argv[2], "w").write("\n".join(lines) + "\n")
 print("\n".join(lines))
+page = pathlib.Path(sys.argv[3])
+text, count = re.subn(r"(<!-- coverage -->\n).*?(<!-- end -->)",
+                      lambda m: m.group(1) + "\n".join(lines) + "\n" + m.group(2), page.read_text(), flags=re.S)
+if count != 1:
+    sys.exit("docs/reliability.md has no place for the coverage")
+page.write_text(text)
 PY
