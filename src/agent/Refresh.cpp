@@ -1,4 +1,7 @@
 // When the cache is rebuilt, and the thread that rebuilds it.
+#include <cerrno>
+#include <new>
+
 #include "agent/ProviderAgent.h"
 #include "common/TVX_Clock.h"
 #include "model/TVX_Data.h"
@@ -92,7 +95,13 @@ void ProviderAgent::joinRefreshThread() {
 }
 
 bool ProviderAgent::startRefreshThread() {
-  if (Thread::create_joinable(m_Thread, DataFetch_Handler, this) != 0) {
+  int status = ENOMEM;
+  try {
+    status = Thread::create_joinable(m_Thread, DataFetch_Handler, this);
+  } catch (const std::bad_alloc&) {
+    // As if the system had refused it.
+  }
+  if (status != 0) {
     TVX_LOG(TVX_CRIT, "DataFetch_Handler thread could not be created");
     return false;
   }
@@ -179,7 +188,8 @@ bool ProviderAgent::finishRun() {
   // work to it.
   if (m_bSANRefreshPending) return false;
   m_bThreadRunning = false;
-  m_LoadedTime = tvxNowDatetime();
+  // Without memory for the time the old one stays, and the next reader asks for a run again.
+  contain("DataFetch_Handler", [this] { m_LoadedTime = tvxNowDatetime(); });
   return true;
 }
 

@@ -10,6 +10,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <new>
 
 #include "common/TVX_Common.h"
 #include "common/TVX_File.h"
@@ -74,18 +75,21 @@ CLogger& getLogger() {
 void CLogger::log(const char* file, const unsigned* line, int level, const char* format, ...) {
   va_list args;
   va_start(args, format);
-  const TVX_Formatted text(format, args);
+  try {
+    const TVX_Formatted text(format, args);
+    // Held for a disabled logger too: its back end must not go away under the message.
+    const Auto_Mutex lock(logMutex());
+    if (!isEnabled() && registeredCIMLogger != nullptr) {
+      registeredCIMLogger->log(level, file, line, text.c_str());
+    } else {
+      for (TVX_LoggerInterface* interface : m_Interfaces)
+        interface->log(level, file, line, text.c_str());
+    }
+  } catch (const std::bad_alloc&) {
+    // The message is lost. Whoever has something to say must not fail over it, least of all the
+    // refresh thread or a destructor.
+  }
   va_end(args);
-
-  // Held for a disabled logger too: its back end must not go away under the message.
-  const Auto_Mutex lock(logMutex());
-  if (!isEnabled() && registeredCIMLogger != nullptr) {
-    registeredCIMLogger->log(level, file, line, text.c_str());
-    return;
-  }
-  for (TVX_LoggerInterface* interface : m_Interfaces) {
-    interface->log(level, file, line, text.c_str());
-  }
 }
 
 // ---- Back ends ----

@@ -38,15 +38,17 @@ FCAdapter::FCAdapter(const std::string& name, std::int32_t number)
     : Adapter(name, number, TVX_ADAPTER_TYPE_FC) {
   auto attributes = std::make_unique<FCAdapterAttributes>(this);
   m_FunctionType = attributes->FunctionType;
-  m_pStatistics = std::make_unique<FCAdapterStatistics>(this).release();
-  const std::uint32_t count = attributes->NumberOfPorts;
+  auto statistics = std::make_unique<FCAdapterStatistics>(this);
+  const std::uint32_t count = std::min(attributes->NumberOfPorts, MAX_PORTS);
+  m_Ports.reserve(count);
+  // From here on nothing throws: an adapter that is not built is not destroyed either.
+  m_pStatistics = statistics.release();
   m_pAttributes = attributes.release();
   buildPorts(count);
 }
 
 void FCAdapter::buildPorts(std::uint32_t count) {
-  m_Ports.reserve(std::min(count, MAX_PORTS));
-  for (std::uint32_t index = 0; index < std::min(count, MAX_PORTS); ++index) {
+  for (std::uint32_t index = 0; index < count; ++index) {
     try {
       m_Ports.push_back(std::make_unique<FCPort>(this, index).release());
     } catch (...) {

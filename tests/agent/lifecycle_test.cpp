@@ -1,6 +1,5 @@
 // The agent's life: its count, what construction reads and opens, what destruction leaves.
 #include <dlfcn.h>
-#include <pthread.h>
 #include <sys/stat.h>
 #include <syslog.h>
 #include <unistd.h>
@@ -11,6 +10,7 @@
 #include <thread>
 
 #include "Agent_Fixture.h"
+#include "No_Threads.h"
 #include "access/TVX_Runtime_Loader.h"
 #include "agent/Signal_Trace.h"
 #include "common/TVX_Memory.h"
@@ -325,28 +325,6 @@ TEST_F(Lifecycle, UnloadWaitsForAnAdapterBuildThatIsUnderWay) {
   EXPECT_EQ(log.level("PERF: Waiting for m_bIsAdapterDataReady"), TVX_DBG);
   EXPECT_EQ(log.level("PERF: Woken up from wait for m_bIsAdapterDataReady"), TVX_DBG);
 }
-
-/// Gives new threads a stack that no machine has.
-class No_Threads {
- public:
-  No_Threads() {
-    pthread_getattr_default_np(&m_Before);
-    pthread_attr_t huge;
-    pthread_getattr_default_np(&huge);
-    pthread_attr_setstacksize(&huge, std::size_t{1} << 46);
-    pthread_setattr_default_np(&huge);
-    pthread_attr_destroy(&huge);
-  }
-  ~No_Threads() {
-    pthread_setattr_default_np(&m_Before);
-    pthread_attr_destroy(&m_Before);
-  }
-  No_Threads(const No_Threads&) = delete;
-  No_Threads& operator=(const No_Threads&) = delete;
-
- private:
-  pthread_attr_t m_Before;
-};
 
 TEST_F(Lifecycle, WithoutAThreadTheReaderBuildsTheMapsItself) {
   ProviderAgent& agent = startAgent();

@@ -1,5 +1,10 @@
 // What the builders of the maps say when memory runs out.
+#include <chrono>
+#include <new>
+#include <thread>
+
 #include "../logs/Failing_New.h"
+#include "No_Threads.h"
 #include "San_Test.h"
 #include "agent/Associations.h"
 #include "agent/MapSteps.h"
@@ -112,6 +117,65 @@ TEST_F(No_Memory, DiagnosticsThatCannotBeMadeDoNotEndTheBuild) {
     EXPECT_EQ(buildDiagnostics(host), 0);
   }
   EXPECT_EQ(log.level("Exception in FCHBA Diagnostics feature class creation"), TVX_DBG);
+}
+
+/// A refresh that is short of blocks of that size. A request without memory may fail before it.
+void refreshShortOf(ProviderAgent& agent, std::size_t size, int spare) {
+  const Failing_New failing(size, spare);
+  agent.m_bAdapterRefreshPending = true;
+  try {
+    agent.BuildCimrtInfo();
+  } catch (const std::bad_alloc&) {
+    EXPECT_FALSE(agent.m_bThreadRunning) << "nobody may wait for a run that there is not";
+  }
+}
+
+/// True once no run is under way.
+bool endsSoon(ProviderAgent& agent) {
+  for (int tries = 0; tries < 10'000; tries++) {
+    {
+      Ranked_Lock thread(agent.m_ThreadMutex);
+      if (!agent.m_bThreadRunning) return true;
+    }
+    std::this_thread::sleep_for(std::chrono::milliseconds(1));
+  }
+  return false;
+}
+
+TEST_F(No_Memory, BuildsThatRunOutOfItEndAndTheNextOneIsWhole) {
+  ProviderAgent& agent = build();
+  for (std::size_t size = 8; size <= 400; size += 8) {
+    SCOPED_TRACE(size);
+    for (const int spare : {0, 20}) {
+      const No_Threads none;  // memory is refused to this thread alone
+      refreshShortOf(agent, size, spare);
+    }
+    ASSERT_FALSE(agent.m_bThreadRunning);
+    ASSERT_TRUE(agent.m_bIsAdapterDataReady && agent.m_bIsAdapterMapsReady);
+  }
+  EXPECT_EQ(log.level("Exception in updateAdapterMaps - do nothing"), TVX_CRIT);
+  EXPECT_EQ(log.level("Exception in DataFetch_Handler - do nothing"), TVX_CRIT);
+  for (Ranked_Mutex* mutex : {&agent.m_AdapterDataReadyMutex, &agent.m_AdapterMapsReadyMutex,
+                              &agent.m_SANMapsReadyMutex, &agent.m_DataMutex})
+    EXPECT_TRUE(isFree(*mutex));
+  agent.m_bAdapterRefreshPending = true;
+  agent.BuildCimrtInfo();
+  awaitIdle(agent);
+  EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 4u);
+}
+
+TEST_F(No_Memory, ThreadThatCannotBeMadeLeavesTheRunToItsCaller) {
+  ProviderAgent& agent = build();
+  for (std::size_t size = 8; size <= 128; size += 8)
+    for (const int spare : {0, 1}) {
+      refreshShortOf(agent, size, spare);
+      ASSERT_TRUE(endsSoon(agent));
+    }
+  EXPECT_EQ(log.level("DataFetch_Handler thread could not be created"), TVX_CRIT);
+  agent.m_bAdapterRefreshPending = true;
+  agent.BuildCimrtInfo();
+  awaitIdle(agent);
+  EXPECT_EQ(agent.m_TVXHBA_FCPort_map.size(), 4u);
 }
 
 }  // namespace
