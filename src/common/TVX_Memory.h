@@ -15,7 +15,8 @@ struct TVX_Free {
 /// A block of `calloc`, freed with `free`; null when memory ran out.
 using TVX_Block = std::unique_ptr<std::uint8_t, TVX_Free>;
 
-/// A zeroed block of at least `size` bytes, aligned for any type; null when memory ran out.
+/// A zeroed block of that size, aligned for any type; null when memory ran out, or for over 512
+/// MiB.
 TVX_Block tvxAllocate(std::size_t size);
 
 /// Gives zeroed memory from `calloc`, or null.

@@ -294,6 +294,8 @@ TEST(Memory, IsZeroedAndMayRunOut) {
   ASSERT_NE(block, nullptr);
   EXPECT_EQ(std::count(block.get(), block.get() + 64, 0), 64);
   EXPECT_NE(cimrt::tvxAllocate(0), nullptr);
+  EXPECT_NE(cimrt::tvxAllocate(std::size_t{512} << 20), nullptr);
+  EXPECT_EQ(cimrt::tvxAllocate((std::size_t{512} << 20) + 1), nullptr);
   cimrt::tvxSetAllocator([](std::size_t) -> void* { return nullptr; });
   EXPECT_EQ(cimrt::tvxAllocate(1), nullptr);
   cimrt::tvxSetAllocator(nullptr);
