@@ -4,6 +4,7 @@
 
 #include <fstream>
 #include <sstream>
+#include <utility>
 
 #include "broker/Router.h"
 
@@ -87,7 +88,11 @@ const CMPIBroker* Broker::face() const {
 }
 
 Reply Broker::run(const Request& request) {
-  return m_Impl->run(request);
+  Reply reply = m_Impl->run(request);
+  if (request.takeInstance) {
+    for (const Instance& kept : std::exchange(reply.instances, {})) request.takeInstance(kept);
+  }
+  return reply;
 }
 
 Reply Broker::enumerateInstanceNames(std::string_view className) {

@@ -117,6 +117,9 @@ struct Request {
   /// Request to the one provider of `path`'s class (associations: of `assocClass`, or of
   /// `resultClass` for references) with the class name as it stands; no search through subclasses.
   bool exact = false;
+  /// If set, gets each instance as the provider returns it, on the provider's thread, and the reply
+  /// keeps none: servers stream large answers so. The instance is the taker's for the call only.
+  std::function<void(const Instance&)> takeInstance;
 };
 
 struct Status {

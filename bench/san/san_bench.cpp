@@ -1,7 +1,8 @@
-// bench_san [build|classes] [once] [units...]: what many logical units cost, as Markdown tables.
-// Without arguments 1,000, 10,000 and 100,000 units are measured, which takes about five minutes
-// and two gigabytes; "build" leaves the classes out, "classes" all else; "once" is for tools that
-// count instructions and need no medians.
+// bench_san [build|classes] [once] [CLASS] [units...]: what many logical units cost, as Markdown
+// tables.
+// Without arguments 1,000, 10,000 and 100,000 units are measured, which takes about fifteen minutes
+// and a gigabyte; "build" leaves the classes out, "classes" all else; CLASS keeps to the classes
+// of its family; "once" is for tools that count instructions and need no medians.
 #include <time.h>
 #include <unistd.h>
 
@@ -30,9 +31,9 @@ namespace {
 
 /// How often what is measured.
 struct Repetitions {
-  int series = 3;  ///< of all sizes in turn; the median counts
-  int rounds =
-      5;  ///< of the largest size in a series, and five times as many of 1,000; the median counts
+  int buildSeries = 5;  ///< of all sizes in turn; the median counts
+  int classSeries = 3;
+  int rounds = 5;  ///< of a size in a series, five times as many of 1,000; the median counts
 
   /// Small work is over so soon that whatever else the machine does shows in it.
   int roundsFor(std::size_t units) const {
@@ -126,11 +127,10 @@ void clearMap(Agent_Maps& maps) {
 /// The maps that a host of volumes fills. Texts are shared between the copies of an instance and
 /// are counted with the last holder, so the copies go first.
 constexpr Map_Row MAPS[] = {
-    {"paths (copies of initiator, target, volume)",
-     clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map>},
-    {"system devices (copies of system, volume)",
+    {"paths", clearMap<&Agent_Maps::m_TVXHBA_SCSIInitiatorTargetStorageVolumePath_map>},
+    {"system devices (with the copy of the volume)",
      clearMap<&Agent_Maps::m_TVXHBA_StorageVolumeSystemDevice_map>},
-    {"hosted access points (copies of system, target)",
+    {"hosted access points (with the copy of the target)",
      clearMap<&Agent_Maps::m_TVXHBA_LocalHostedAccessPoint_map>},
     {"volumes", clearMap<&Agent_Maps::m_TVXHBA_StorageVolume_map>},
     {"target endpoints", clearMap<&Agent_Maps::m_TVXHBA_SCSIProtocolEndpoint_map>},
@@ -219,6 +219,17 @@ const Family FAMILIES[] = {
       "TVXHBA_SCSIInitiatorTargetLogicalDiskPath"}},
 };
 
+/// Has all instances of a class returned, to a server that has streamed each before the next comes;
+/// how many there were.
+std::size_t enumerate(host::Broker& broker, const char* className) {
+  std::size_t instances = 0;
+  host::Request request;
+  request.path.className = className;
+  request.takeInstance = [&instances](const host::Instance&) { instances++; };
+  require(broker.run(request).status.ok(), className);
+  return instances;
+}
+
 Rows measureClasses(const Family& family, std::size_t units) {
   const Private_Root root;
   require(tvxsim_load_text(manyUnits(units, family.deviceType).c_str()) == 0, tvxsim_last_error());
@@ -229,9 +240,9 @@ Rows measureClasses(const Family& family, std::size_t units) {
   broker.load(TVX_PROVIDER_LIBRARY);
   Rows rows;
   for (const char* name : family.classes) {
-    require(broker.enumerateInstances(name).instances.size() == units, name);
+    require(enumerate(broker, name) == units, name);
     const double time = middleTime(
-        units, [&] { return broker.enumerateInstances(name); }, [] { returnFreedMemory(); });
+        units, [&] { return enumerate(broker, name); }, [] { returnFreedMemory(); });
     rows.push_back({name, number(time, 1)});
   }
   broker.unload();
@@ -276,10 +287,10 @@ Rows middleRows(const std::vector<Rows>& series) {
 
 /// Measures all sizes in turn, and that several times: what else the machine does meets them all.
 /// The middle rows by size.
-std::vector<Rows> measureInTurn(const std::vector<std::size_t>& sizes,
+std::vector<Rows> measureInTurn(int times, const std::vector<std::size_t>& sizes,
                                 const std::function<Rows(std::size_t)>& measure) {
   std::vector<std::vector<Rows>> found(sizes.size());
-  for (int series = 0; series < repetitions.series; series++)
+  for (int series = 0; series < times; series++)
     for (std::size_t i = 0; i < sizes.size(); i++)
       found[i].push_back(inChild([&] { return measure(sizes[i]); }));
   std::vector<Rows> middle;
@@ -288,7 +299,7 @@ std::vector<Rows> measureInTurn(const std::vector<std::size_t>& sizes,
 }
 
 void printBuild(const std::vector<std::size_t>& sizes) {
-  const std::vector<Rows> results = measureInTurn(sizes, measureBuild);
+  const std::vector<Rows> results = measureInTurn(repetitions.buildSeries, sizes, measureBuild);
   printHead({"Units", "Scan less the library, ms", "growth", "Library, ms", "Map build, ms",
              "growth", "Resident bytes a unit"});
   for (std::size_t i = 0; i < sizes.size(); i++) {
@@ -303,7 +314,12 @@ void printBuild(const std::vector<std::size_t>& sizes) {
   std::printf("\n");
 }
 
-void printClasses(const std::vector<std::size_t>& sizes) {
+bool has(const Family& family, const std::string& className) {
+  return className.empty() ||
+         std::find(family.classes.begin(), family.classes.end(), className) != family.classes.end();
+}
+
+void printClasses(const std::vector<std::size_t>& sizes, const std::string& only) {
   std::vector<std::string> head = {"Class, ms"};
   for (const std::size_t units : sizes) {
     head.push_back(std::to_string(units) + " units");
@@ -311,8 +327,10 @@ void printClasses(const std::vector<std::size_t>& sizes) {
   }
   printHead(head);
   for (const Family& family : FAMILIES) {
-    const std::vector<Rows> results = measureInTurn(
-        sizes, [&family](std::size_t units) { return measureClasses(family, units); });
+    if (!has(family, only)) continue;
+    const std::vector<Rows> results =
+        measureInTurn(repetitions.classSeries, sizes,
+                      [&family](std::size_t units) { return measureClasses(family, units); });
     for (std::size_t i = 0; i < family.classes.size(); i++) {
       std::vector<std::string> row = {family.classes[i]};
       for (const Rows& rows : results) {
@@ -324,38 +342,35 @@ void printClasses(const std::vector<std::size_t>& sizes) {
   }
 }
 
-/// What has to be told before a process starts: the folder of the simulated libraries, which are
-/// opened by name, and that memory comes in large pages. With small ones the processor's table of
-/// addresses covers a thousand units and not ten thousand, and that is what would be measured.
-void startAnewPrepared(char** arguments) {
-  const char* const tunables = "glibc.malloc.hugetlb=1";
+/// Starts anew with the folder of the simulated libraries told, which are opened by name.
+void findLibraries(char** arguments) {
   const char* path = std::getenv("LD_LIBRARY_PATH");
-  const char* pages = std::getenv("GLIBC_TUNABLES");
-  if (path != nullptr && std::string(path).starts_with(TVX_SIM_LIBRARIES) && pages != nullptr)
-    return;
+  if (path != nullptr && std::string(path).starts_with(TVX_SIM_LIBRARIES)) return;
   setenv("LD_LIBRARY_PATH", TVX_SIM_LIBRARIES, 1);
-  setenv("GLIBC_TUNABLES", tunables, 0);
   execv("/proc/self/exe", arguments);
   require(false, "cannot start anew");
 }
 
 int run(int count, char** arguments) {
-  startAnewPrepared(arguments);
+  findLibraries(arguments);
   std::string part;
+  std::string only;
   std::vector<std::size_t> sizes;
   for (int i = 1; i < count; i++) {
     const std::size_t units = std::strtoul(arguments[i], nullptr, 10) / 10 * 10;
     if (units > 0) sizes.push_back(units);
     if (units > 0) continue;
     if (std::string(arguments[i]) == "once") {
-      repetitions = {1, 1};
+      repetitions = {1, 1, 1};
+    } else if (std::string(arguments[i]).starts_with("TVXHBA_")) {
+      only = arguments[i];
     } else {
       part = arguments[i];
     }
   }
   if (sizes.empty()) sizes = {1'000, 10'000, 100'000};
   if (part != "classes") printBuild(sizes);
-  if (part != "build") printClasses(sizes);
+  if (part != "build") printClasses(sizes, only);
   return 0;
 }
 

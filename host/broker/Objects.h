@@ -68,7 +68,8 @@ struct ContextContents {
 };
 
 struct ResultContents {
-  Reply* reply = nullptr;  ///< belongs to the request
+  Reply* reply = nullptr;            ///< belongs to the request
+  const Request* request = nullptr;  ///< outlives the result; may be absent
 };
 
 struct SelectContents {
@@ -99,7 +100,8 @@ CMPIDateTime* makeDateTime(Core& core, std::string text, Origin origin);
 CMPIEnumeration* makeEnumeration(Core& core, CMPIType elementType, Value::List items,
                                  Origin origin);
 CMPIContext* makeContext(Core& core, NamedValues entries, Origin origin);
-CMPIResult* makeResult(Core& core, Reply& reply);
+/// Without a request the reply keeps everything.
+CMPIResult* makeResult(Core& core, Reply& reply, const Request* request = nullptr);
 CMPISelectExp* makeSelectExp(Core& core, std::string query, std::string language, Origin origin);
 
 inline CMPIStatus status(CMPIrc rc) {

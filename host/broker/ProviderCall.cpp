@@ -79,7 +79,7 @@ ProviderCall::ProviderCall(Core& core, ProviderLibrary& library, const std::stri
 void ProviderCall::makeObjects() {
   m_Context = makeContext(m_Core, contextEntries(m_Core.options(), m_Request.path.nameSpace),
                           Origin::HandedOut);
-  m_Result = makeResult(m_Core, m_Reply);
+  m_Result = makeResult(m_Core, m_Reply, &m_Request);
   ObjectPath path = withServersKeys(m_Request.path, m_Core.options());
   if (!m_Core.options().tellsNameSpace) {
     path.nameSpace.clear();

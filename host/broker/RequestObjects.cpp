@@ -105,7 +105,12 @@ CMPIStatus returnInstance(const CMPIResult* face, const CMPIInstance* instance) 
   if (object == nullptr || source == nullptr) {
     return status(CMPI_RC_ERR_INVALID_HANDLE);
   }
-  object->contents.reply->instances.push_back(source->contents.instance);
+  const auto& [reply, request] = object->contents;
+  if (request != nullptr && request->takeInstance) {
+    request->takeInstance(source->contents.instance);
+  } else {
+    reply->instances.push_back(source->contents.instance);
+  }
   return status(CMPI_RC_OK);
 }
 
@@ -151,9 +156,10 @@ CMPIContext* makeContext(Core& core, NamedValues entries, Origin origin) {
       ->face();
 }
 
-CMPIResult* makeResult(Core& core, Reply& reply) {
+CMPIResult* makeResult(Core& core, Reply& reply, const Request* request) {
   return core
-      .adopt(std::make_unique<ResultObject>(core, core.tables().result, ResultContents{&reply}),
+      .adopt(std::make_unique<ResultObject>(core, core.tables().result,
+                                            ResultContents{&reply, request}),
              Origin::HandedOut)
       ->face();
 }

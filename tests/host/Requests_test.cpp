@@ -197,6 +197,29 @@ TEST(RequestTest, ForeignInstancesAreServedToo) {
   EXPECT_THROW(broker.addForeignFile("/nowhere/store.json"), std::runtime_error);
 }
 
+TEST(RequestTest, ATakerGetsEachInstanceAndTheReplyKeepsNone) {
+  FakeBroker broker;
+  broker.addForeign(
+      R"({"version": 1, "instances": [{"class": "FAKE_Foreign", "properties": {"Id": "a"}}]})");
+  for (const char* className : {"CIM_Thing", "FAKE_Foreign"}) {
+    const Reply whole = broker.enumerateInstances(className);
+    ASSERT_FALSE(whole.instances.empty()) << className;
+    Request request;
+    request.path.className = className;
+    std::vector<std::string> taken;
+    request.takeInstance = [&](const Instance& instance) {
+      taken.push_back(printPath(instance.path));
+    };
+    const Reply streamed = broker.run(request);
+    EXPECT_EQ(streamed.status.rc, CMPI_RC_OK) << streamed.status.message;
+    EXPECT_EQ(streamed.done, whole.done);
+    EXPECT_TRUE(streamed.instances.empty());
+    std::vector<std::string> expected;
+    for (const Instance& instance : whole.instances) expected.push_back(printPath(instance.path));
+    EXPECT_EQ(taken, expected) << className;
+  }
+}
+
 TEST(RequestTest, IndicationsAreCollected) {
   FakeBroker broker;
   broker.misbehave("indication");
