@@ -10,6 +10,7 @@
 #include <thread>
 
 #include "common/TVX_Clock.h"
+#include "common/TVX_Memory.h"
 #include "tvxsim/tvxsim.h"
 
 namespace cimrt::test {
@@ -90,7 +91,9 @@ void Agent_Test::SetUp() {
 }
 
 void Agent_Test::TearDown() {
+  tvxSetAllocator(nullptr);
   if (m_bReferenced) stopAgent();
+  tvxSetSleep(nullptr);
   getLogger().dropInterfaces();
   tvxSetClock(nullptr);
   std::filesystem::remove_all(root);
@@ -111,6 +114,13 @@ ProviderAgent& Agent_Test::startAgent() {
   ProviderAgent::addRef();
   m_bReferenced = true;
   return *agent;
+}
+
+ProviderAgent& Agent_Test::builtAgent(const std::string& json) {
+  useScenario(json);
+  ProviderAgent& agent = startAgent();
+  refresh(agent);
+  return agent;
 }
 
 void Agent_Test::stopAgent() {

@@ -40,7 +40,8 @@ class Log_Record : public TVX_LoggerInterface {
   std::vector<Logged> m_Messages;
 };
 
-/// Base of the agent's tests. Each test has its own root folder and starts with no agent.
+/// Base of the agent's tests. Each test has its own root folder and starts with no agent; clock,
+/// sleep and allocator are the system's own again after it.
 class Agent_Test : public ::testing::Test {
  protected:
   void SetUp() override;
@@ -51,6 +52,8 @@ class Agent_Test : public ::testing::Test {
   void addFault(const std::string& json);
   /// The agent, with a reference that `TearDown` gives back.
   ProviderAgent& startAgent();
+  /// The agent of a scenario's host, with its adapter maps ready.
+  ProviderAgent& builtAgent(const std::string& json);
   /// Gives the reference back now: the agent is gone afterwards.
   void stopAgent();
   /// Runs refreshes until the adapter maps are ready, and waits for the thread to end.

@@ -46,10 +46,6 @@ class Live_Status : public Adapter_Maps {
   static std::int64_t crcErrors(const Delivered& from, std::size_t i) {
     return numberOf(from.at<TVXHBA_FCPortStatistics>(i)->CRCErrors);
   }
-  void TearDown() override {
-    tvxSetAllocator(nullptr);
-    Adapter_Maps::TearDown();
-  }
   /// Runs an update as the active form does: all that it logged.
   std::vector<Logged> linesOf(ProviderAgent& agent, Live_Update update) {
     log.clear();

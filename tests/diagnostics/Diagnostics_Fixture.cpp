@@ -101,9 +101,7 @@ void Diagnostics_Test::SetUp() {
 
 void Diagnostics_Test::TearDown() {
   setDiagnosticFactory(nullptr);
-  tvxSetAllocator(nullptr);
   Agent_Test::TearDown();
-  tvxSetSleep(nullptr);
   setDlOperations(nullptr);
 }
 

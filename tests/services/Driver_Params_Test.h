@@ -47,16 +47,7 @@ class Driver_Params : public Agent_Test {
   }
   static inline std::vector<std::size_t> sizes;
 
-  ProviderAgent& build(const std::string& scenario = TWO_PORTS) {
-    useScenario(scenario);
-    ProviderAgent& agent = startAgent();
-    refresh(agent);
-    return agent;
-  }
-  void TearDown() override {
-    tvxSetAllocator(nullptr);
-    Agent_Test::TearDown();
-  }
+  ProviderAgent& build(const std::string& scenario = TWO_PORTS) { return builtAgent(scenario); }
   static void readLocal(ProviderAgent& agent, Delivered& to) {
     agent.enumActiveInstances(agent.m_TVXHBA_DriverParams_map, to.handler(),
                               updateLocalDriverParams);

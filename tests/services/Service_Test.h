@@ -19,19 +19,16 @@ class Service_Test : public Agent_Test {
 
   /// The host with more members for its first port, such as `"boot_code_enabled": true`.
   ProviderAgent& build(const std::string& members = {}) {
-    useScenario(R"({"cards": [{"serial_number": "S1", "ports": [
+    agent = &builtAgent(R"({"cards": [{"serial_number": "S1", "ports": [
         {"wwpn": "10000000000000A1", "wwnn": "20000000000000A1")" +
-                (members.empty() ? "" : ", " + members) +
-                R"(}, {"wwpn": "10000000000000A2", "wwnn": "20000000000000A2"}]}]})");
-    agent = &startAgent();
-    refresh(*agent);
+                        (members.empty() ? "" : ", " + members) +
+                        R"(}, {"wwpn": "10000000000000A2", "wwnn": "20000000000000A2"}]}]})");
     log.clear();
     tvxsim_forget_calls();
     return *agent;
   }
   void TearDown() override {
     tvxSetSleep(nullptr);
-    tvxSetAllocator(nullptr);
     if (agent) awaitIdle(*agent);
     Agent_Test::TearDown();
   }

@@ -48,15 +48,8 @@ void* notedMemory(std::size_t size) {
 class Optimized_Access : public Agent_Test {
  protected:
   ProviderAgent& build(const std::string& members = {}) {
-    useScenario(hostWith(members));
-    ProviderAgent& ready = startAgent();
-    refresh(ready);
-    agent = &ready;
-    return ready;
-  }
-  void TearDown() override {
-    tvxSetAllocator(nullptr);
-    Agent_Test::TearDown();
+    agent = &builtAgent(hostWith(members));
+    return *agent;
   }
   TVXHBA_DriverParams* unit(const std::string& id) {
     return entryOf(agent->m_TVXHBA_DriverParams_map, &TVXHBA_DriverParams::InstanceID, id);

@@ -16,18 +16,10 @@ constexpr const char* PORT = "1000000000000001";
 class Port_Virtualization : public Agent_Test {
  protected:
   ProviderAgent& build(const std::string& vports) {
-    useScenario(R"({"cards": [{"ports": [
+    return builtAgent(R"({"cards": [{"ports": [
         {"wwpn": "10:00:00:00:00:00:00:01", "wwnn": "20:00:00:00:00:00:00:01", "vports": )" +
-                vports + R"(},
+                      vports + R"(},
         {"wwpn": "10:00:00:00:00:00:00:02", "wwnn": "20:00:00:00:00:00:00:02"}]}]})");
-    ProviderAgent& agent = startAgent();
-    refresh(agent);
-    return agent;
-  }
-
-  void TearDown() override {
-    tvxSetAllocator(nullptr);
-    Agent_Test::TearDown();
   }
 
   static constexpr const char* TWO =

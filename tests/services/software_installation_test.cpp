@@ -79,7 +79,6 @@ class Installation : public Agent_Test {
     log.clear();
   }
   void TearDown() override {
-    tvxSetAllocator(nullptr);
     awaitIdle(*agent);
     Agent_Test::TearDown();
     setDlOperations(nullptr);

@@ -12,15 +12,9 @@ constexpr const char* PORT = "1000000000000001";
 class Transceivers : public Agent_Test {
  protected:
   ProviderAgent& build(const std::string& transceiver) {
-    useScenario(R"({"cards": [{"ports": [{"wwpn": "10:00:00:00:00:00:00:01", "transceiver": )" +
-                transceiver + "}]}]}");
-    ProviderAgent& agent = startAgent();
-    refresh(agent);
-    return agent;
-  }
-  void TearDown() override {
-    tvxSetAllocator(nullptr);
-    Agent_Test::TearDown();
+    return builtAgent(
+        R"({"cards": [{"ports": [{"wwpn": "10:00:00:00:00:00:00:01", "transceiver": )" +
+        transceiver + "}]}]}");
   }
 
   static constexpr const char* ALL =

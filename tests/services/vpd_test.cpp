@@ -20,15 +20,8 @@ class Vpd_Test : public Agent_Test {
  protected:
   /// One card SN1 whose port has these members more.
   ProviderAgent& build(const std::string& more, const std::string& card = {}) {
-    useScenario(R"({"cards": [{"model": "TVX1", "serial_number": "SN1", )" + card +
-                R"("ports": [{"wwpn": "10:00:00:00:00:00:00:01")" + more + "}]}]}");
-    ProviderAgent& agent = startAgent();
-    refresh(agent);
-    return agent;
-  }
-  void TearDown() override {
-    tvxSetAllocator(nullptr);
-    Agent_Test::TearDown();
+    return builtAgent(R"({"cards": [{"model": "TVX1", "serial_number": "SN1", )" + card +
+                      R"("ports": [{"wwpn": "10:00:00:00:00:00:00:01")" + more + "}]}]}");
   }
 };
 

@@ -26,12 +26,15 @@ class Wwn_Service : public Service_Test {
   }
   const TVXHBA_FCHBAWWNService* service() { return agent->m_TVXHBA_FCHBAWWNService_map[0]; }
 
+  // A change starts a refresh, which takes the maps down: what follows looks into them again.
   std::uint32_t change(const TVXHBA_FCPort* target) {
     EXPECT_EQ(provider.ChangeWWN(service(), target, newWWPN, newWWNN, type, operation, result), 0);
+    awaitIdle(*agent);
     return result.value;
   }
   std::uint32_t restore(const TVXHBA_FCPort* target) {
     EXPECT_EQ(provider.RestoreWWN(service(), target, type, operation, result), 0);
+    awaitIdle(*agent);
     return result.value;
   }
   std::uint32_t read(std::uint16_t kind) {
