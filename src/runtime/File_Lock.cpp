@@ -4,8 +4,12 @@
 
 #include <cerrno>
 
+#include "runtime/Safe_Open.h"
+
 namespace cimrt {
 namespace {
+
+constexpr mode_t LOCK_PERMISSIONS = 0600;
 
 /// A request over the whole file.
 struct flock whole_file(short type) {
@@ -20,7 +24,7 @@ struct flock whole_file(short type) {
 File_Lock::File_Lock(const char* path)
     : _lock(whole_file(F_WRLCK)),
       _unlock(whole_file(F_UNLCK)),
-      _fd(::open(path, O_WRONLY | O_CREAT | O_CLOEXEC, 0600)) {}
+      _fd(open_descriptor(path, LOCK_PERMISSIONS)) {}
 
 File_Lock::~File_Lock() {
   if (usable()) ::close(_fd);

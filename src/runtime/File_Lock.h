@@ -5,7 +5,8 @@
 
 namespace cimrt {
 
-/// Opens the lock file, making it if need be, for its own life. Not for several threads at a time.
+/// Opens the lock file, making it if need be, for its own life; where everybody may make files,
+/// only one of this user's own. Not for several threads at a time.
 class File_Lock {
  public:
   explicit File_Lock(const char* path);

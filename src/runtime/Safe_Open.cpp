@@ -61,4 +61,8 @@ std::FILE* open_for_writing(const char* path, const char* mode, mode_t permissio
   return stream;
 }
 
+int open_descriptor(const char* path, mode_t permissions) {
+  return open_file(path, "a", permissions);
+}
+
 }  // namespace cimrt

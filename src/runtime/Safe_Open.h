@@ -20,4 +20,8 @@ inline constexpr mode_t SETTINGS_PERMISSIONS = 0644;
 /// the stream.
 std::FILE* open_for_writing(const char* path, const char* mode, mode_t permissions);
 
+/// The same as a descriptor for a file whose contents do not matter: it is made if need be, and
+/// left as it is. Answers -1, with `errno` set, on failure; the caller closes the descriptor.
+int open_descriptor(const char* path, mode_t permissions);
+
 }  // namespace cimrt

@@ -173,6 +173,22 @@ TEST_F(Log_Test, TheLockFileIsForItsOwnerAlone) {
   EXPECT_EQ(st.st_mode & 0777u, 0600u);
 }
 
+TEST_F(Log_Test, LinksInADirectoryThatIsOpenToEveryoneAreNotFollowed) {
+  write_rc("LOG_LEVEL=DBG\n");
+  fs::create_directory(home() / ".cimrt");
+  fs::permissions(home() / ".cimrt", fs::perms::all);
+  const fs::path lock = messages().string() + ".lock";
+  fs::create_symlink(home() / "made by a lock", lock);
+  EXPECT_EQ(log_every_level(), "");
+  EXPECT_FALSE(fs::exists(home() / "made by a lock"));
+  fs::remove(lock);
+  fs::create_symlink(home() / "made by the log", messages());
+  EXPECT_EQ(log_every_level(), "");
+  EXPECT_FALSE(fs::exists(home() / "made by the log"));
+  fs::remove(messages());
+  EXPECT_EQ(lines_in(log_every_level()), 5U) << "without links it logs";
+}
+
 TEST_F(Log_Test, TheDirectoryIsOpenToEveryoneWhomTheMaskAllows) {
   write_rc("LOG_LEVEL=DBG\n");
   in_child([] {
