@@ -18,19 +18,30 @@ void empty_references(Instances& elements) {
   elements.clear();
 }
 
+/// Puts clones of the source's elements in the place of those that `elements` has. Without memory
+/// for them it stays as it is.
+void copy_references(Instances& elements, const Instances& source) {
+  Instances before = elements;
+  Instances clones;
+  try {
+    clones.reserve(source.size());
+    for (const Instance* element : source) clones.append(clone_or_null(element));
+    elements = clones;
+  } catch (...) {
+    empty_references(clones);
+    throw;
+  }
+  empty_references(before);
+}
+
 void copy_reference(Instance* dest, const Instance* src, const Meta_Reference* mr) {
   if (mr->subscript == 0) {
     // Cloned first: the source's target may be the one that is released.
     set_reference(target_of(dest, mr), clone_or_null(target_of(src, mr)));
     return;
   }
-  Instances clones;
-  for (const Instance* element : targets_of(src, mr)) clones.append(clone_or_null(element));
-  auto& elements = targets_of(dest, mr);
-  const std::uint8_t null = *null_flag(src, mr);
-  empty_references(elements);
-  elements = clones;
-  *null_flag(dest, mr) = null;
+  copy_references(targets_of(dest, mr), targets_of(src, mr));
+  *null_flag(dest, mr) = *null_flag(src, mr);
 }
 
 void copy_property(Instance* dest, const Instance* src, const Meta_Property* mp) {

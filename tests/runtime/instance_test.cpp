@@ -4,9 +4,11 @@
 
 #include <cmath>
 #include <cstdlib>
+#include <new>
 #include <string>
 #include <vector>
 
+#include "../logs/Failing_New.h"
 #include "Test_Schema.h"
 
 namespace cimrt {
@@ -291,6 +293,39 @@ TEST(Copy, WithAModelTakesOnlyWhatIsNonNullThere) {
   EXPECT_STREQ(dest->Id.value.c_str(), "source");
   ASSERT_EQ(dest->Members.value.size(), 1u);
   EXPECT_TRUE(identical(dest->Members.value[0], source->Members.value[0]));
+}
+
+/// A group of two members.
+Ref<T_Group> two_members() {
+  Ref<T_Group> group = make<T_Group>();
+  group->Members.append(make_device("first", 1).release());
+  group->Members.append(make_device("second", 2).release());
+  return group;
+}
+
+TEST(Copy, WithoutMemoryForAMemberLeavesTheMembersThatWereThere) {
+  const Ref<T_Group> source = two_members();
+  const Ref<T_Group> dest = make<T_Group>();
+  dest->Members.append(make_device("own", 3).release());
+  for (const int spare : {0, 1}) {
+    const Failing_New no_memory(sizeof(T_Device), spare);
+    EXPECT_THROW(copy(dest.get(), source.get()), std::bad_alloc);
+  }
+  ASSERT_EQ(dest->Members.value.size(), 1u);
+  EXPECT_TRUE(identical(dest->Members.value[0], make_device("own", 3).get()));
+  copy(dest.get(), source.get());
+  EXPECT_EQ(dest->Members.value.size(), 2u);
+}
+
+TEST(Clone, WithoutMemoryForAMemberIsNotMade) {
+  const Ref<T_Group> source = two_members();
+  for (const int spare : {0, 1}) {
+    const Failing_New no_memory(sizeof(T_Device), spare);
+    EXPECT_THROW(clone(source.get()), std::bad_alloc);
+  }
+  EXPECT_EQ(source->Members.value[0]->refs.load(), 1u);
+  const Ref<T_Group> copy(clone(source.get()));
+  EXPECT_EQ(copy->Members.value.size(), 2u);
 }
 
 TEST(Copy, OfAnInstanceOntoItselfChangesNothing) {
