@@ -241,7 +241,8 @@ class Broker {
   std::vector<ScopeReport> threadReports() const;
   /// Threads that were prepared and never detached.
   std::size_t openAttachments() const;
-  /// Releases and uses that came after the end of their request (strict mode).
+  /// Releases and uses that came after the end of their request (strict mode), and releases on
+  /// another thread than the object was made on.
   std::vector<std::string> lateNotes() const;
 
   class Impl;

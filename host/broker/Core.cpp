@@ -53,6 +53,9 @@ CMPIStatus Core::release(Tracked* object) {
   }
   if (object->origin() == Origin::Cloned) {
     owner().countClone(object->kind(), true);
+  } else if (object->m_Thread != std::this_thread::get_id()) {
+    noteLate(fmt::format("{} made by \"{}\" was released on another thread",
+                         kindName(object->kind()), object->request()));
   }
   object->m_Scope->remove(object);
   bury(object, Life::Released);

@@ -5,6 +5,7 @@
 #include <cstdint>
 #include <memory>
 #include <string>
+#include <thread>
 
 namespace tvx::host {
 
@@ -69,9 +70,10 @@ class Tracked {
   Origin m_Origin = Origin::Created;
   std::atomic<Life> m_Life{Life::Alive};
   std::shared_ptr<const std::string> m_Request;
-  Scope* m_Scope = nullptr;       ///< guarded by the scope's mutex
-  Tracked* m_Next = nullptr;      ///< the same
-  Tracked* m_Previous = nullptr;  ///< the same
+  const std::thread::id m_Thread = std::this_thread::get_id();  ///< that made the object
+  Scope* m_Scope = nullptr;                                     ///< guarded by the scope's mutex
+  Tracked* m_Next = nullptr;                                    ///< the same
+  Tracked* m_Previous = nullptr;                                ///< the same
 };
 
 }  // namespace tvx::host

@@ -4,6 +4,7 @@
 
 #include <cstring>
 #include <string>
+#include <thread>
 
 #include "cmpi/cmpimacs.h"
 
@@ -324,6 +325,8 @@ unsigned misbehave(const std::string& how, const CMPIContext* context) {
     broker->mft->cmpiFree(broker, broker->mft->cmpiMalloc(broker, 1));
   } else if (how == "keep") {
     lateString = string;
+  } else if (how == "release-elsewhere") {
+    std::thread([string] { CMRelease(string); }).join();
   } else if (how == "release-kept") {
     CMRelease(lateString);
   } else if (how == "unknown-property" || how == "wrong-type") {

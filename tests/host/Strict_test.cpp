@@ -45,6 +45,14 @@ TEST(StrictTest, AReleaseAfterTheRequestIsNoted) {
                                     "after the end of its request"}));
 }
 
+TEST(StrictTest, AReleaseOnAnotherThreadIsNoted) {
+  FakeBroker broker(true);
+  EXPECT_FALSE(broker.misbehave("release-elsewhere").report.leaks());
+  EXPECT_EQ(broker.lateNotes(),
+            (std::vector<std::string>{"CMPIString made by \"invokeMethod FAKE_Widget\" was "
+                                      "released on another thread"}));
+}
+
 TEST(StrictTest, AClonedObjectThatStaysIsALeak) {
   FakeBroker broker(true);
   const Reply leaked = broker.misbehave("leak-clone");
