@@ -2,9 +2,11 @@
 // it can fail, while a client asks for everything. The rows run in child processes, so that a crash
 // or a hang is an outcome and not the end.
 //
-// usage: fault_matrix [--every N] [--row TEXT] [--jobs N] [--report FILE] [--seconds N]
+// usage: fault_matrix [--every N] [--row TEXT] [--mode NAME]... [--jobs N] [--report FILE]
+// [--seconds N]
 //   --every N     of each N cells one, another in each row (1: the whole matrix)
 //   --row TEXT    only entry points whose name holds the text
+//   --mode NAME   only this way of failing, as Fault_Modes.h calls it; may be given several times
 //   --jobs N      so many rows at once (default 1)
 //   --report FILE the table in Markdown
 //   --seconds N   a cell that takes longer hangs (default 60)
@@ -30,6 +32,7 @@
 #include "Whole_Client.h"
 #include "schema/ClassData.h"
 #include "tests/support/Elf_File.h"
+#include "tests/support/Request_Thread.h"
 #include "tvxsim/tvxsim.h"
 
 #if defined(__SANITIZE_ADDRESS__)
@@ -55,6 +58,7 @@ constexpr std::size_t REACHED = 72;
 struct Choice {
   std::size_t every = 1;
   std::string row;
+  std::vector<std::string> modes;
   std::string report;
   std::size_t jobs = 1;
   std::chrono::seconds patience{60};
@@ -153,8 +157,11 @@ void runCell(const host::ClassCatalogue& classes, const std::string& entryPoint,
 
 // ---- Rows ----
 
-bool isChosen(const Choice& choice, std::size_t row, std::size_t mode) {
-  return (row + mode) % choice.every == 0;
+bool isChosen(const Choice& choice, std::size_t row, const std::vector<Fault_Mode>& modes,
+              std::size_t mode) {
+  const bool named = choice.modes.empty() || std::find(choice.modes.begin(), choice.modes.end(),
+                                                       modes[mode].name) != choice.modes.end();
+  return named && (row + mode) % choice.every == 0;
 }
 
 /// Runs the cells of a row from `first` on; the process's exit status tells of leaked memory.
@@ -163,9 +170,9 @@ bool isChosen(const Choice& choice, std::size_t row, std::size_t mode) {
                          Progress& progress) {
   const std::vector<Fault_Mode> modes = faultModes();
   for (std::size_t i = first; i < modes.size(); ++i) {
-    if (!isChosen(choice, row, i)) continue;
+    if (!isChosen(choice, row, modes, i)) continue;
     progress.cell = i;
-    runCell(classes, entryPoint, &modes[i], progress);
+    Request_Thread([&] { runCell(classes, entryPoint, &modes[i], progress); });
     progress.libraryCalls += tvxsim_calls(entryPoint.c_str(), nullptr);
     ++progress.cells;
   }
@@ -244,7 +251,7 @@ std::vector<std::string> calledEntryPoints(const host::ClassCatalogue& classes,
   if (pipe(ends) != 0) std::abort();
   const pid_t child = fork();
   if (child == 0) {
-    runCell(classes, "", nullptr, progress);
+    Request_Thread([&] { runCell(classes, "", nullptr, progress); });
     std::string text;
     for (const std::string& name : offered)
       if (tvxsim_calls(name.c_str(), nullptr) > 0) text += name + "\n";
@@ -310,6 +317,7 @@ Choice parse(int argc, char** argv) {
     const std::string value = argv[i + 1];
     if (name == "--every") choice.every = std::max(1UL, std::stoul(value));
     if (name == "--row") choice.row = value;
+    if (name == "--mode") choice.modes.push_back(value);
     if (name == "--jobs") choice.jobs = std::max(1UL, std::stoul(value));
     if (name == "--report") choice.report = value;
     if (name == "--seconds") choice.patience = std::chrono::seconds(std::stol(value));

@@ -3,13 +3,17 @@
 // again.
 //
 // usage: soak [--seconds N] [--clients N] [--strict] [--report FILE]
-// Ends with 1 if a reply was lost, a request leaked, an unload was refused, or memory kept growing.
+// Ends with 1 if a reply was lost or not what a client expects, a request leaked, an unload was
+// refused, nothing was refreshed, or memory kept growing.
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
 #include <chrono>
 #include <fstream>
 #include <iostream>
+#include <list>
+#include <map>
 #include <mutex>
 #include <random>
 #include <shared_mutex>
@@ -18,6 +22,7 @@
 #include "Trial_Root.h"
 #include "Whole_Client.h"
 #include "schema/ClassData.h"
+#include "tests/support/Request_Thread.h"
 #include "tvxsim/tvxsim.h"
 
 namespace tvx::test {
@@ -116,7 +121,8 @@ void runServer(Trial& trial) {
   for (std::size_t round = 1; !trial.isOver(); ++round) {
     std::this_thread::sleep_for(std::chrono::milliseconds(5));
     const char* name = trial.served[random() % trial.served.size()]->name;
-    for (const auto kind : {host::InterfaceKind::Instance, host::InterfaceKind::Method}) {
+    for (const auto kind : {host::InterfaceKind::Instance, host::InterfaceKind::Association,
+                            host::InterfaceKind::Method}) {
       const auto lock = trial.use();
       trial.broker->cleanup(name, kind, true);
       ++trial.cleanUps;
@@ -139,6 +145,24 @@ constexpr bool UNDER_SANITIZER = true;
 #else
 constexpr bool UNDER_SANITIZER = false;
 #endif
+
+/// Answers that a client gets when all is well. A request fails that comes between the cleanup of
+/// its provider and the provider's next life.
+const std::map<int, const char*> EXPECTED = {{CMPI_RC_OK, "succeeded"},
+                                             {CMPI_RC_ERR_FAILED, "failed"},
+                                             {CMPI_RC_ERR_NOT_FOUND, "found nothing"},
+                                             {CMPI_RC_ERR_NOT_SUPPORTED, "were not supported"},
+                                             {CMPI_RC_ERR_ALREADY_EXISTS, "made what was there"}};
+
+bool isExpected(const Client_Tally& tally) {
+  return std::all_of(tally.byStatus.begin(), tally.byStatus.end(),
+                     [](const auto& each) { return EXPECTED.count(each.first) != 0; });
+}
+
+/// How often the adapters were read anew, the first time of each life among them.
+unsigned long refreshes() {
+  return tvxsim_calls("HBA_GetNumberOfAdapters", nullptr);
+}
 
 /// Resident sizes over the time of the trial, in KiB.
 struct Memory {
@@ -174,11 +198,19 @@ void writeReport(std::ostream& out, const Trial& trial, const Memory& memory) {
   out << "| What | Figure |\n|---|---|\n"
       << "| Clients | " << trial.choice.clients << " |\n"
       << "| Seconds | " << trial.choice.time.count() << " |\n"
-      << "| Requests answered | " << trial.tally.requests << " |\n"
+      << "| Requests answered | " << trial.tally.requests << " |\n";
+  for (const auto& [status, number] : trial.tally.byStatus) {
+    const auto known = EXPECTED.find(status);
+    out << "| Of these "
+        << (known == EXPECTED.end() ? "had status " + std::to_string(status) : known->second)
+        << " | " << number << " |\n";
+  }
+  out << "| Answers without an end | " << trial.tally.lost.size() << " |\n"
       << "| Methods called | " << trial.tally.methods << " |\n"
       << "| Instances delivered | " << trial.tally.instances << " |\n"
       << "| Providers cleaned up under way | " << trial.cleanUps << " |\n"
       << "| Lives of the library | " << trial.lives << " |\n"
+      << "| Refreshes of its cache | " << refreshes() << " |\n"
       << "| Unloads refused | " << trial.refusals << " |\n"
       << "| Requests that leaked | " << trial.tally.leaks.size() << " |\n"
       << "| Resident, second quarter, KiB | " << memory.warm << " |\n"
@@ -189,7 +221,7 @@ int runSoak(const Choice& choice) {
   const host::ClassCatalogue classes(host::allClasses, host::allClassCount);
   Trial trial(choice, classes);
   std::vector<std::atomic<std::size_t>> beats(choice.clients);
-  std::vector<std::thread> threads;
+  std::list<Request_Thread> threads;
   for (std::size_t i = 0; i < choice.clients; ++i)
     threads.emplace_back(
         [&trial, &beats, i] { runClient(trial, 100U + static_cast<unsigned>(i), beats[i]); });
@@ -199,17 +231,19 @@ int runSoak(const Choice& choice) {
     std::cerr << "soak: a client has had no reply for 30 s\n";
     std::abort();  // where the threads stand is told by the core file
   }
-  for (std::thread& thread : threads) thread.join();
+  threads.clear();
   server.join();
   const bool unloaded = trial.broker->unload(true).ok();
   for (const std::string& leak : trial.tally.leaks) std::cerr << leak << "\n";
+  for (const std::string& lost : trial.tally.lost) std::cerr << "without an end: " << lost << "\n";
   writeReport(std::cout, trial, memory);
   if (!choice.report.empty()) {
     std::ofstream report(choice.report);
     writeReport(report, trial, memory);
   }
   const bool good = unloaded && trial.refusals == 0 && trial.tally.leaks.empty() &&
-                    memory.isFlat() && trial.tally.requests > 0;
+                    trial.tally.lost.empty() && isExpected(trial.tally) &&
+                    refreshes() > trial.lives && memory.isFlat() && trial.tally.requests > 0;
   std::cout << (good ? "good\n" : "NOT good\n");
   return good ? 0 : 1;
 }

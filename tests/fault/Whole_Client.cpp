@@ -18,11 +18,17 @@ void Client_Tally::add(const Client_Tally& other) {
   methods += other.methods;
   for (const auto& [status, number] : other.byStatus) byStatus[status] += number;
   leaks.insert(leaks.end(), other.leaks.begin(), other.leaks.end());
+  lost.insert(lost.end(), other.lost.begin(), other.lost.end());
 }
 
 Whole_Client::Whole_Client(host::Broker& broker, const host::ClassCatalogue& classes,
                            std::string folder)
     : m_Broker(broker), m_Classes(classes), m_Folder(std::move(folder)) {}
+
+Reply Whole_Client::countWhole(Reply reply, const std::string& what) {
+  if (reply.status.ok() && !reply.done) m_Tally.lost.push_back(what);
+  return count(std::move(reply), what);
+}
 
 Reply Whole_Client::count(Reply reply, const std::string& what) {
   ++m_Tally.requests;
@@ -34,12 +40,12 @@ Reply Whole_Client::count(Reply reply, const std::string& what) {
 
 const ObjectPath* Whole_Client::readInstancesOf(const ClassData& classData) {
   const std::string name = classData.name;
-  count(m_Broker.enumerateInstanceNames(name), "names of " + name);
-  const Reply all = count(m_Broker.enumerateInstances(name), "instances of " + name);
+  countWhole(m_Broker.enumerateInstanceNames(name), "names of " + name);
+  const Reply all = countWhole(m_Broker.enumerateInstances(name), "instances of " + name);
   m_First.erase(name);
   if (all.instances.empty()) return nullptr;
   const ObjectPath& path = m_First[name] = all.instances.front().path;
-  count(m_Broker.getInstance(path), "instance of " + name);
+  countWhole(m_Broker.getInstance(path), "instance of " + name);
   return &path;
 }
 
@@ -57,7 +63,8 @@ void Whole_Client::readEverything() {
 void Whole_Client::readInstances() {
   for (const ClassData* each : m_Classes.all())
     if (each->isServed)
-      count(m_Broker.enumerateInstances(each->name), std::string("instances of ") + each->name);
+      countWhole(m_Broker.enumerateInstances(each->name),
+                 std::string("instances of ") + each->name);
 }
 
 const ObjectPath* Whole_Client::firstOf(const std::string& className) {
@@ -130,7 +137,7 @@ void Whole_Client::changeEverything() {
     const ClassData* classData = m_Classes.find(name);
     const ObjectPath* first = firstOf(name);
     if (classData == nullptr || first == nullptr) continue;
-    const Reply found = count(m_Broker.getInstance(*first), std::string("get ") + name);
+    const Reply found = countWhole(m_Broker.getInstance(*first), std::string("get ") + name);
     if (found.instances.empty()) continue;
     Instance instance = found.instances.front();
     if (instance.has("RetentionCount"))

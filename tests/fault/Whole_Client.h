@@ -18,6 +18,7 @@ struct Client_Tally {
   std::size_t methods = 0;
   std::map<int, std::size_t> byStatus;  ///< requests by CMPI return code
   std::vector<std::string> leaks;       ///< accounts of requests that left something behind
+  std::vector<std::string> lost;        ///< requests that succeeded without an end to their answer
 
   void add(const Client_Tally& other);
 };
@@ -57,6 +58,8 @@ class Whole_Client {
 
  private:
   host::Reply count(host::Reply reply, const std::string& what);
+  /// The same of an answer that the provider must end.
+  host::Reply countWhole(host::Reply reply, const std::string& what);
   const host::ObjectPath* firstOf(const std::string& className);
   /// Names, instances and one instance by its path, which is answered; null if there is none.
   const host::ObjectPath* readInstancesOf(const host::ClassData& classData);
