@@ -68,6 +68,8 @@ std::vector<host::Instance> Provider_Test::instances(const std::string& classNam
   EXPECT_EQ(reply.status.rc, CMPI_RC_OK) << className << ": " << reply.status.message;
   EXPECT_FALSE(reply.report.leaks()) << className << "\n" << reply.report.text();
   EXPECT_TRUE(reply.report.complaints.empty()) << className;
+  const auto kind = static_cast<std::size_t>(host::ObjectKind::Instance);
+  EXPECT_EQ(reply.report.leftBehind[kind], 0u) << className << ": instances pile up";
   return std::move(reply.instances);
 }
 

@@ -95,12 +95,12 @@ class Hygiene : public Provider_Test {
     return call("TVXHBA_FCTagService", method, {{"URI", Value::string(uri)}, {"Target", port()}});
   }
 
-  /// Files below a folder, with what everybody may do to them.
+  /// Files and folders below a folder that everybody may write.
   static std::vector<std::string> writableByAll(const fs::path& below) {
     std::vector<std::string> found;
     for (const auto& entry : fs::recursive_directory_iterator(below)) {
       struct stat info {};
-      if (::lstat(entry.path().c_str(), &info) == 0 && S_ISREG(info.st_mode) &&
+      if (::lstat(entry.path().c_str(), &info) == 0 && !S_ISLNK(info.st_mode) &&
           (info.st_mode & S_IWOTH) != 0)
         found.push_back(entry.path().string());
     }

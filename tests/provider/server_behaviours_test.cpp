@@ -1,20 +1,20 @@
 // The library under servers of every kind: what they hand out, how they start and stop, and what
 // their processes lack.
+#include <dlfcn.h>
 #include <fcntl.h>
 #include <linux/capability.h>
-#include <pthread.h>
 #include <sys/syscall.h>
 
 #include <atomic>
 #include <chrono>
 #include <fstream>
-#include <functional>
 #include <map>
 #include <sstream>
 #include <thread>
 
 #include "Child_Process.h"
 #include "Provider_Fixture.h"
+#include "tests/support/Request_Thread.h"
 #include "tvxsim/tvxsim.h"
 
 namespace tvx::test {
@@ -33,11 +33,25 @@ constexpr const char* PLATFORM = R"({"version": 1, "namespaces": ["root/ibmse"],
 
 class Server_Behaviours : public Provider_Test {
  protected:
-  /// How many instances each class has.
-  std::map<std::string, std::size_t> census() {
-    std::map<std::string, std::size_t> counts;
-    for (const std::string& name : servedClasses()) counts[name] = instances(name).size();
-    return counts;
+  /// What the instances of each class tell.
+  using Census = std::map<std::string, std::vector<std::string>>;
+  Census census() {
+    instances("TVXHBA_StorageVolume");  // waits for the scan, which adds to what adapters tell
+    Census texts;
+    for (const std::string& name : servedClasses())
+      for (const host::Instance& instance : instances(name))
+        texts[name].push_back(contentsOf(instance));
+    return texts;
+  }
+  /// Keys and properties as texts, but for times, which go on from one look to the next.
+  static std::string contentsOf(const host::Instance& instance) {
+    std::string text;
+    for (const host::NamedValue& key : instance.path.keys)
+      text += key.name + "=" + key.value.display() + ";";
+    for (const host::NamedValue& each : instance.properties)
+      if (each.value.type() != CMPI_dateTime)
+        text += " " + each.name + "=" + each.value.display() + ";";
+    return text;
   }
 
   /// Takes the first instance of every class by its path, and walks from some of them.
@@ -87,9 +101,10 @@ class Server_Behaviours : public Provider_Test {
 // ---- What a server hands out
 
 TEST_F(Server_Behaviours, ServersOfEveryVersionSeeTheSame) {
+  tvxsim_hold_clock(1);
   load();
-  const auto expected = census();
-  EXPECT_GT(expected.at("TVXHBA_FCPort"), 0U);
+  const Census expected = census();
+  EXPECT_EQ(expected.at("TVXHBA_FCPort").size(), 4U);
   unload();
   for (const int version : {0, 100, 200}) {
     BrokerOptions options;
@@ -103,11 +118,16 @@ TEST_F(Server_Behaviours, ServersOfEveryVersionSeeTheSame) {
 }
 
 TEST_F(Server_Behaviours, KeysAreFoundInEveryFormThatServersGiveThem) {
+  tvxsim_hold_clock(1);
+  load();
+  const Census expected = census();
+  unload();
   for (const KeyForm form :
        {KeyForm::Declared, KeyForm::Unsigned64, KeyForm::Signed64, KeyForm::Text}) {
     BrokerOptions options;
     options.keys = form;
     load(options);
+    EXPECT_EQ(census(), expected);
     expectEveryClassIsReached();
     unload();
   }
@@ -167,21 +187,56 @@ TEST_F(Server_Behaviours, AMethodThatRanAnswersAValueOfAType) {
   std::size_t answered = 0;
   for (const std::string& name : servedClasses()) {
     const Reply names = broker->enumerateInstanceNames(name);
-    if (names.paths.empty()) continue;
     for (const host::MethodData& method : host::methods(*classes->find(name))) {
+      EXPECT_NE(method.returnType, CMPI_ref) << name << "." << method.name;
+      if (names.paths.empty()) continue;
       const Reply reply = broker->invokeMethod(names.paths.front(), method.name);
       if (reply.status.rc != CMPI_RC_OK) continue;
       EXPECT_NE(reply.returnValue.type(), CMPI_null) << name << "." << method.name;
-      EXPECT_NE(method.returnType, CMPI_ref) << name << "." << method.name;
+      for (const host::NamedValue& output : reply.outputs)
+        EXPECT_NE(output.value.type(), CMPI_null) << name << "." << method.name << output.name;
       ++answered;
     }
   }
   EXPECT_GT(answered, 10U);
 }
 
-TEST_F(Server_Behaviours, APathWithoutNamespaceIsServed) {
+TEST_F(Server_Behaviours, APropertyWithoutAValueIsLeftUnset) {
   load();
-  const auto expected = census();
+  std::size_t seen = 0;
+  for (const std::string& name : servedClasses())
+    for (const host::Instance& instance : instances(name)) {
+      for (const host::NamedValue& each : instance.properties) {
+        EXPECT_NE(each.value.type(), CMPI_null) << name << "." << each.name;
+        EXPECT_FALSE(each.value.isNull()) << name << "." << each.name;
+        ++seen;
+      }
+      for (const host::NamedValue& key : instance.path.keys)
+        EXPECT_FALSE(key.value.isNull()) << name << "." << key.name;
+    }
+  EXPECT_GT(seen, 1000U);
+}
+
+TEST_F(Server_Behaviours, EveryRequestMayHaveAThreadOfItsOwn) {
+  load();
+  std::atomic<std::size_t> good{0};
+  for (const std::string& name : servedClasses()) {
+    const auto ask = [&] { good += broker->enumerateInstances(name).status.rc == CMPI_RC_OK; };
+    std::thread first(ask);
+    std::thread second(ask);
+    first.join();
+    second.join();
+  }
+  EXPECT_EQ(good, 2 * servedClasses().size());
+  EXPECT_EQ(broker->unload().rc, CMPI_RC_OK);
+  EXPECT_FALSE(broker->stillMapped(TVX_PROVIDER_LIBRARY)) << "a thread's data keeps the library";
+  broker.reset();
+}
+
+TEST_F(Server_Behaviours, APathWithoutNamespaceIsServed) {
+  tvxsim_hold_clock(1);
+  load();
+  const Census expected = census();
   unload();
   for (const int version : {0, 200}) {
     BrokerOptions options;
@@ -190,6 +245,41 @@ TEST_F(Server_Behaviours, APathWithoutNamespaceIsServed) {
     load(options);
     EXPECT_EQ(census(), expected);
     expectEveryClassIsReached();
+    unload();
+  }
+}
+
+/// The path with no namespace in it, nor in the paths that are its keys.
+ObjectPath placeless(ObjectPath path) {
+  path.nameSpace.clear();
+  for (host::NamedValue& key : path.keys.items())
+    if (key.value.type() == CMPI_ref)
+      key.value = Value::reference(placeless(key.value.asReference()));
+  return path;
+}
+
+TEST_F(Server_Behaviours, ReferencesWithoutNamespaceAreUnderstood) {
+  for (const int version : {0, 200}) {
+    BrokerOptions options;
+    options.version = version;
+    options.tellsNameSpace = false;
+    load(options);
+    std::size_t links = 0;
+    for (const std::string& name : servedClasses()) {
+      const Reply names = broker->enumerateInstanceNames(name);
+      if (!classes->find(name)->isAssociation || names.paths.empty()) continue;
+      EXPECT_EQ(broker->getInstance(placeless(names.paths[0])).status.rc, CMPI_RC_OK) << name;
+      ++links;
+    }
+    EXPECT_GT(links, 60U);
+    const auto path = [&](const char* name) {
+      return placeless(broker->enumerateInstanceNames(name).paths.at(0));
+    };
+    const Reply called =
+        broker->invokeMethod(path("TVXHBA_BootBIOSService"), "GetBootBIOSStatus",
+                             {{"Target", Value::reference(path("TVXHBA_FCPort"))}});
+    EXPECT_EQ(called.status.rc, CMPI_RC_OK);
+    EXPECT_EQ(called.returnValue.asUnsigned(), 0U);
     unload();
   }
 }
@@ -244,23 +334,72 @@ TEST_F(Server_Behaviours, TheProcessMayEndWhileTheLibraryIsAtWork) {
             0);
 }
 
+/// Clients that ask for one class each, all the time.
+class Clients {
+ public:
+  explicit Clients(host::Broker& broker) : m_Broker(broker) {
+    for (const char* name : {"TVXHBA_FCPort", "TVXHBA_Card", "TVXHBA_StorageVolume"})
+      m_Threads.emplace_back([this, name] {
+        while (!m_Over) {
+          const int code = m_Broker.enumerateInstances(name).status.rc;
+          // A request that comes after the unloading of its class is refused.
+          if (code != CMPI_RC_OK && code != CMPI_RC_ERR_FAILED) ++wrong;
+          ++answered;
+        }
+      });
+  }
+  void end() {
+    m_Over = true;
+    for (std::thread& each : m_Threads) each.join();
+  }
+  /// They go on until the process ends.
+  void leave() {
+    for (std::thread& each : m_Threads) each.detach();
+  }
+
+  std::atomic<std::size_t> answered{0};
+  std::atomic<std::size_t> wrong{0};
+
+ private:
+  host::Broker& m_Broker;
+  std::atomic<bool> m_Over{false};
+  std::vector<std::thread> m_Threads;
+};
+
 TEST_F(Server_Behaviours, CleanupOnAnotherThreadWhileRequestsRunAndTheProcessEnds) {
+  EXPECT_EQ(
+      inChild([&] {
+        // Until the first answer there is, every client stands inside the library.
+        addFault(R"({"call": "HBA_GetNumberOfAdapters", "nth": 1, "delay_ms": 50})");
+        load();
+        for (const auto kind : {host::InterfaceKind::Association, host::InterfaceKind::Method})
+          EXPECT_NE(broker->interface("TVXHBA_ControlledBy", kind), nullptr);
+        Clients clients(*broker);
+        while (tvxsim_calls("HBA_GetNumberOfAdapters", nullptr) == 0) std::this_thread::yield();
+        EXPECT_EQ(clients.answered, 0U);
+        std::thread server([&] { EXPECT_EQ(broker->cleanupOncePerKind(true).rc, CMPI_RC_OK); });
+        server.join();
+        const std::size_t before = clients.answered;
+        while (clients.answered < before + 6) std::this_thread::yield();
+        clients.end();
+        EXPECT_EQ(clients.wrong, 0U);
+        leaveBroker();
+      }),
+      0);
+}
+
+TEST_F(Server_Behaviours, TheProcessMayEndInTheMiddleOfRequests) {
   EXPECT_EQ(inChild([&] {
+              // Registered first, run last: requests go on behind the library's own end.
+              std::atexit([] { std::this_thread::sleep_for(std::chrono::milliseconds(30)); });
               load();
-              std::vector<std::thread> clients;
-              std::atomic<int> wrong{0};
-              for (const char* name : {"TVXHBA_FCPort", "TVXHBA_Card", "TVXHBA_StorageVolume"})
-                clients.emplace_back([&, name] {
-                  for (int i = 0; i < 20; ++i) {
-                    const int code = broker->enumerateInstances(name).status.rc;
-                    // A request that comes after the unloading of its class is refused.
-                    if (code != CMPI_RC_OK && code != CMPI_RC_ERR_FAILED) ++wrong;
-                  }
-                });
+              static Clients* volatile clients = nullptr;
+              clients = new Clients(*broker);
+              while (clients->answered < 6) std::this_thread::yield();
               std::thread server([&] { broker->cleanupOncePerKind(true); });
               server.join();
-              for (std::thread& client : clients) client.join();
-              EXPECT_EQ(wrong, 0);
+              clients->leave();
+              EXPECT_EQ(clients->wrong, 0U);
               leaveBroker();
             }),
             0);
@@ -317,6 +456,16 @@ TEST_F(Server_Behaviours, TheLibraryIsLoadedByAForkedProcess) {
   serve();
   EXPECT_EQ(inChild(serve), 0);
   serve();
+}
+
+TEST_F(Server_Behaviours, TheLibraryMayBeOpenedForAllToSee) {
+  EXPECT_EQ(inChild([&] {
+              EXPECT_NE(dlopen(TVX_PROVIDER_LIBRARY, RTLD_NOW | RTLD_GLOBAL), nullptr);
+              load();
+              askForEverything();
+              unload();
+            }),
+            0);
 }
 
 TEST_F(Server_Behaviours, TheStandardStreamsMayBeClosed) {
@@ -381,27 +530,9 @@ TEST_F(Server_Behaviours, ARootThatCannotBeWrittenIsNoReasonToFail) {
   EXPECT_TRUE(std::filesystem::is_empty(root / "etc"));
 }
 
-#if defined(__SANITIZE_ADDRESS__) || defined(__SANITIZE_THREAD__)
-constexpr std::size_t REQUEST_STACK =
-    1024 * 1024;  // the sanitizers' frames are several times larger
-#else
-constexpr std::size_t REQUEST_STACK = 256 * 1024;
-#endif
-
 TEST_F(Server_Behaviours, ASmallStackIsEnoughForEveryRequest) {
   load();
-  pthread_attr_t attributes;
-  pthread_attr_init(&attributes);
-  ASSERT_EQ(pthread_attr_setstacksize(&attributes, REQUEST_STACK), 0);
-  std::function<void()> body = [this] { askForEverything(); };
-  const auto work = [](void* function) -> void* {
-    (*static_cast<std::function<void()>*>(function))();
-    return nullptr;
-  };
-  pthread_t thread = {};
-  ASSERT_EQ(pthread_create(&thread, &attributes, work, &body), 0);
-  pthread_join(thread, nullptr);
-  pthread_attr_destroy(&attributes);
+  Request_Thread([this] { askForEverything(); });
 }
 
 }  // namespace
