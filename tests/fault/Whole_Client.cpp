@@ -131,9 +131,22 @@ void Whole_Client::callEverything() {
   for (const Method_Call& each : purposefulCalls(m_Folder)) call(each);
 }
 
+void Whole_Client::changeSettings() {
+  ++m_Changes;
+  const Reply all =
+      countWhole(m_Broker.enumerateInstances("TVXHBA_ProviderConfigSetting"), "settings");
+  for (Instance setting : all.instances) {
+    const bool isMinutes = setting.path.key("InstanceID").asText().ends_with(":cachetimeout");
+    setting.properties.set(
+        "current", Value::number(CMPI_uint32, isMinutes ? m_Changes % 30 + 1 : m_Changes % 2));
+    count(m_Broker.modifyInstance(setting, {{"current"}}), "change a setting");
+  }
+}
+
 void Whole_Client::changeEverything() {
-  for (const char* name : {"TVXHBA_ProviderConfigSetting", "TVXHBA_FCPort", "TVXHBA_DriverParams",
-                           "TVXHBA_DriverParamGlobal", "TVXHBA_DumpData", "TVXHBA_VirtualFCPort"}) {
+  changeSettings();
+  for (const char* name : {"TVXHBA_FCPort", "TVXHBA_DriverParams", "TVXHBA_DriverParamGlobal",
+                           "TVXHBA_DumpData", "TVXHBA_VirtualFCPort"}) {
     const ClassData* classData = m_Classes.find(name);
     const ObjectPath* first = firstOf(name);
     if (classData == nullptr || first == nullptr) continue;

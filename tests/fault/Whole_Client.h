@@ -66,11 +66,14 @@ class Whole_Client {
   /// Every diagnostic test, on the first port, with settings of its own.
   void runTests();
   void callBare(const host::ClassData& classData);
+  /// Gives each of the provider's settings another value than the last time.
+  void changeSettings();
 
   host::Broker& m_Broker;
   const host::ClassCatalogue& m_Classes;
   std::string m_Folder;
   std::map<std::string, host::ObjectPath> m_First;
+  unsigned m_Changes = 0;
   Client_Tally m_Tally;
 };
 
