@@ -138,6 +138,48 @@ TEST_F(Boundary, AnUnknownClassFailsInEveryInterface) {
       EXPECT_EQ(enumerateUnknownClass(*broker, name, names), CMPI_RC_ERR_FAILED) << name;
 }
 
+/// What an association's interface answers to a walk with that filter, which may be null.
+std::size_t walk(host::Broker& broker, const std::string& association,
+                 const host::ObjectPath& source, const char* filter) {
+  host::Core& core = host::Core::of(broker.face());
+  auto* face = static_cast<CMPIAssociationMI*>(
+      broker.interface(association, host::InterfaceKind::Association));
+  host::Scope scope(core, "walk");
+  const host::ScopeGuard guard(scope);
+  Reply reply;
+  const CMPIResult* result = host::makeResult(core, reply);
+  const CMPIContext* context = host::makeContext(core, {}, host::Origin::HandedOut);
+  const CMPIObjectPath* path = host::makePath(core, source, host::Origin::HandedOut);
+  const auto& table = *face->ft;
+  EXPECT_EQ(table.referenceNames(face, context, result, path, filter, nullptr).rc, CMPI_RC_OK);
+  EXPECT_EQ(table.references(face, context, result, path, filter, nullptr, nullptr).rc, CMPI_RC_OK);
+  EXPECT_EQ(reply.paths.size(), reply.instances.size()) << association;
+  EXPECT_EQ(
+      table.associatorNames(face, context, result, path, filter, nullptr, nullptr, nullptr).rc,
+      CMPI_RC_OK);
+  return reply.paths.size() + reply.instances.size();
+}
+
+TEST_F(Boundary, AWalkNeedsNoFilterAndTakesTheClients) {
+  // Servers fill in the association's own class, or hand on what the client wrote.
+  std::size_t walked = 0;
+  for (const std::string& name : servedClasses()) {
+    if (!classes->find(name)->isAssociation) continue;
+    const std::vector<host::Instance> links = instances(name);
+    if (links.empty()) continue;
+    for (const host::NamedValue& end : links.front().properties) {
+      if (end.value.type() != CMPI_ref) continue;
+      const host::ObjectPath& source = end.value.asReference();
+      const std::size_t expected = walk(*broker, name, source, name.c_str());
+      EXPECT_GE(expected, 3U) << name << "." << end.name;
+      for (const char* filter : {static_cast<const char*>(nullptr), "", "CIM_Dependency"})
+        EXPECT_EQ(walk(*broker, name, source, filter), expected) << name << "." << end.name;
+      ++walked;
+    }
+  }
+  EXPECT_GT(walked, 120U);
+}
+
 /// Runs a request again and again, with the first, the second... of the library's allocations
 /// failing, until it gets by without one.
 void failEveryAllocation(const std::function<Reply()>& request) {

@@ -170,6 +170,11 @@ TEST_F(Hygiene, LinksInSharedFoldersAreNotFollowed) {
   fs::create_symlink(root / "absent", folder.path("stream.fw"));
   EXPECT_EQ(installBytes("x", folder.path("new.fw")), 4u);
   EXPECT_EQ(installBytes("x", folder.path("stream.fw")), 4u);
+  fs::permissions(root / "var/log", fs::perms::all | fs::perms::sticky_bit);
+  fs::create_symlink(root / "precious", root / "var/log/trace.log");
+  fs::create_symlink(root / "absent", root / "var/log/new.log");
+  EXPECT_NE(logInto("var/log/trace.log"), 0u);
+  EXPECT_NE(logInto("var/log/new.log"), 0u);
   fs::permissions(root / "dumps", fs::perms::all | fs::perms::sticky_bit);
   fs::create_symlink(root / "precious", root / "dumps/table.xml");
   fs::create_symlink(root / "absent", root / "dumps/new.xml");
