@@ -193,13 +193,15 @@ void joinFreedMemory() {
 }
 
 /// Takes the instances down unit by unit, as they were built. Those of one unit stand side by side
-/// and share texts: map by map, all of the memory would have to be fetched once for each map.
+/// and share texts: map by map, all of the memory would have to be fetched once for each map. The
+/// first unit of each class is left, so that the maps themselves run empty in their order.
 void clearUnits(Agent_Maps& maps) {
   std::array<std::size_t, std::size(SAN)> sizes{};
   for (std::size_t i = 0; i < std::size(SAN); i++) sizes[i] = SAN[i](maps).size();
   const std::size_t slices = *std::max_element(sizes.begin(), sizes.end()) / SLICE;
   for (std::size_t left = slices; left-- > 0;) {
-    for (std::size_t i = 0; i < std::size(SAN); i++) SAN[i](maps).shorten(sizes[i] * left / slices);
+    for (std::size_t i = 0; i < std::size(SAN); i++)
+      SAN[i](maps).shorten(std::max<std::size_t>(sizes[i] * left / slices, 1));
     joinFreedMemory();
   }
 }

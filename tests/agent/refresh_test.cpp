@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "Agent_Fixture.h"
+#include "Lock_Witness.h"
 #include "model/TVX_Data.h"
 #include "tvxsim/tvxsim.h"
 
@@ -136,6 +137,22 @@ TEST_F(Refresh, ReadinessMovesFromGroupToGroup) {
   EXPECT_EQ(readiness.take(), (Moments{"rrr", "b-r", "rb-"}));
   EXPECT_EQ(readiness.now(), "rr-");
 }
+
+#ifndef NDEBUG  // locks are only booked in debug builds
+TEST_F(Refresh, SANIsScannedAndItsMapsAreBuiltUnderTheDataLock) {
+  ProviderAgent& agent = startAgent();
+  Lock_Witness before(BEGIN);
+  before.wasHeld = true;
+  Lock_Witness scan("buildSANData");
+  Lock_Witness command("Send Read Capacity");
+  Lock_Witness maps("PERF: updateSANMaps: Entry");
+  refresh(agent);
+  EXPECT_FALSE(before.wasHeld);
+  EXPECT_TRUE(scan.wasHeld);
+  EXPECT_TRUE(command.wasHeld);
+  EXPECT_TRUE(maps.wasHeld);
+}
+#endif
 
 TEST_F(Refresh, FurtherRunsJoinTheOneBefore) {
   ProviderAgent& agent = startAgent();

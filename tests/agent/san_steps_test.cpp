@@ -70,6 +70,12 @@ TEST_F(San_Steps, RefreshServesTheUnitsOfThePortsBeforeOneThatTheAdapterMapsLack
   Delivered delivered;
   agent.enumSANInstances(agent.m_TVXHBA_SCSIProtocolEndpoint_map, delivered.handler());
   EXPECT_EQ(delivered.size(), 2u);
+  log.clear();
+  EXPECT_EQ(rebuildSAN(agent), MAP_BUILD_FAILED);
+  const std::vector<std::string> lines = {
+      "Creating classes for port 0.", "Creating classes for target 0 of 2.",
+      "Creating classes for target 1 of 2.", "Creating classes for port 1.", NO_INITIATOR};
+  EXPECT_EQ(log.only(lines), lines);
 }
 
 TEST_F(San_Steps, PartialMapsAreServedAndTheNextRefreshRepairsThem) {
@@ -118,6 +124,28 @@ TEST_F(San_Steps, AdapterThatIsNoFCAdapterEndsTheBuild) {
   agent.m_pData->m_AdapterCount++;
   EXPECT_EQ(rebuildSAN(agent), MAP_BUILD_FAILED);
   EXPECT_EQ(log.level(ERROR), TVX_ERR);
+}
+
+/// A port of no kind that the builders know.
+class Odd_Port : public Port {
+ public:
+  explicit Odd_Port(Adapter* adapter) : Port(adapter) {}
+  PortAttributes* getAttributes() override { return nullptr; }
+  PortStatistics* refreshStatistics() override { return nullptr; }
+  Adapter* getAdapter() override { return m_pAdapter; }
+  void rescanTargets(Adapter*) override {}
+  std::vector<Target*>& getTargets() override { return m_Targets; }
+  Target* getTarget(int) override { return nullptr; }
+  std::size_t getNumberOfTargets() override { return 0; }
+};
+
+TEST_F(San_Steps, PortThatIsNoFCPortEndsTheBuild) {
+  ProviderAgent& agent = buildUnits(R"({"count": 2})");
+  Adapter* const adapter = agent.m_pData->m_Adapters[0];
+  adapter->m_Ports.push_back(new Odd_Port(adapter));
+  EXPECT_EQ(rebuildSAN(agent), MAP_BUILD_FAILED);
+  EXPECT_EQ(log.level(ERROR), TVX_ERR);
+  EXPECT_EQ(agent.m_TVXHBA_StorageVolume_map.size(), 2u);
 }
 
 TEST_F(San_Steps, UnitsNeedAComputerSystem) {
@@ -202,6 +230,28 @@ TEST_F(San_Steps, RemotePortLeadsToTheChipOfItsPort) {
       "SerialNumber + Sub-AdapterID: " + text(chip->Tag), "Chip Tag: " + text(chip->Tag)};
   EXPECT_EQ(log.only(lines), lines);
   for (const std::string& line : lines) EXPECT_EQ(log.level(line), TVX_DBG) << line;
+}
+
+TEST_F(San_Steps, RemotePortsLeadToTheChipsOfTheirOwnPorts) {
+  ProviderAgent& agent = build(R"({"cards": [
+    {"serial_number": "A", "ports": [{"wwpn": "1000000000000001"}]},
+    {"serial_number": "B", "ports": [{"wwpn": "1000000000000002"}]}]})");
+  ASSERT_EQ(agent.m_TVXHBA_Chip_map.size(), 2u);
+  const struct {
+    const char* port;
+    std::size_t chip;
+    std::vector<std::string> lines;  // the walk over the chips ends with the one that is found
+  } rows[] = {{"1000000000000001", 0, {"Chip Tag: A"}},
+              {"1000000000000002", 1, {"Chip Tag: A", "Chip Tag: B"}}};
+  for (const auto& row : rows) {
+    log.clear();
+    EXPECT_EQ(findPortTarget(agent, row.port + std::string("|5000000000000001")).chip,
+              agent.m_TVXHBA_Chip_map[row.chip]);
+    EXPECT_EQ(log.only({"Found the FCPort Instance: 1000000000000001",
+                        "Found the FCPort Instance: 1000000000000002"}),
+              std::vector{std::string("Found the FCPort Instance: ") + row.port});
+    EXPECT_EQ(log.only({"Chip Tag: A", "Chip Tag: B"}), row.lines);
+  }
 }
 
 TEST_F(San_Steps, RemotePortOfNoPortTakesTheLastOne) {

@@ -6,6 +6,7 @@
 #include <array>
 #include <cstring>
 #include <map>
+#include <numeric>
 #include <string>
 #include <utility>
 #include <vector>
@@ -25,6 +26,9 @@ using tvx::test::Logged;
 using tvx::test::wwnOf;
 
 constexpr const char* FAILURE = "HBA_SendScsiInquiry_t(0x80) returns ";
+constexpr const char* SENSE =
+    "Sense Data: 01 02 03 04 05 06 07 08 09 0a 0b 0c 0d 0e 0f 10 11 12 13 14 15 16 17 18 ";
+constexpr int CALL = 0;  // level of no message
 
 /// The commands of a unit, by page; READ CAPACITY apart.
 enum Command_Kind { STANDARD = 0, SERIAL = 0x80, IDENTIFICATION = 0x83, CAPACITY = 0x100 };
@@ -72,7 +76,13 @@ class Targets : public testing::Test {
     EXPECT_EQ(host.open, 0);
   }
 
+  /// Puts a call of the library between the lines of the log.
+  void mark(const std::string& call) {
+    if (callsAreMarked) capture.log(CALL, nullptr, nullptr, ("-> " + call).c_str());
+  }
+
   HBA_STATUS map(HBA_FCPTARGETMAPPING* out) {
+    mark("mapping of " + std::to_string(out->NumberOfEntries));
     asked.push_back(out->NumberOfEntries);
     const HBA_STATUS forced = asked.size() <= statuses.size() ? statuses[asked.size() - 1] : 0;
     if (forced != 0 && forced != 7) return forced;
@@ -86,6 +96,7 @@ class Targets : public testing::Test {
   }
 
   HBA_STATUS command(Command_Kind kind, void* response, void* sense) {
+    mark("command " + std::to_string(kind));
     if (sent.empty() || sent.back() != kind) {
       EXPECT_TRUE(isZero(response, 255) && isZero(sense, 128)) << "at the first try of " << kind;
     }
@@ -98,7 +109,8 @@ class Targets : public testing::Test {
     }
     auto& [status, text] = answers[kind];
     std::memcpy(response, text.data(), std::min<std::size_t>(text.size(), 255));
-    std::memset(sense, 0x5A, 24);
+    auto* const senseBytes = static_cast<std::uint8_t*>(sense);
+    std::iota(senseBytes, senseBytes + TVX_SCSI_SENSE_SIZE, std::uint8_t{1});
     return status;
   }
 
@@ -128,8 +140,9 @@ class Targets : public testing::Test {
   Data data;
   std::vector<HBA_FCPSCSIENTRY> rows;
   std::vector<HBA_STATUS> statuses;  // of the mapping calls
-  HBA_UINT32 claimed = 0;            // count left in the buffer, if not 0
-  std::vector<HBA_UINT32> asked;     // room of each mapping call
+  bool callsAreMarked = false;
+  HBA_UINT32 claimed = 0;         // count left in the buffer, if not 0
+  std::vector<HBA_UINT32> asked;  // room of each mapping call
   std::map<Command_Kind, std::pair<HBA_STATUS, std::string>> answers;
   std::map<Command_Kind, std::vector<HBA_STATUS>> firstStatuses;  // before those answers
   std::vector<int> sent;
@@ -301,6 +314,16 @@ TEST_F(Targets, AnotherFailureEndsTheScan) {
   EXPECT_FALSE(capture.has(TVX_DBG, "Successful target info fetched"));
 }
 
+TEST_F(Targets, AnEmptyMappingIsNotToldOfWhereTheCallFailed) {
+  host.libraries.provide(HBA_GetFcpTargetMapping, [](HBA_HANDLE, HBA_FCPTARGETMAPPING* out) {
+    out->NumberOfEntries = 0;
+    return HBA_STATUS{12};
+  });
+  data.buildSANData();
+  EXPECT_TRUE(capture.has(TVX_ERR, "Error hbaStatus=12"));
+  EXPECT_FALSE(capture.has(TVX_DBG, "HBA_GetFcpTargetMapping_t() found no target mappings"));
+}
+
 TEST_F(Targets, WithoutMemoryThereAreNone) {
   addRow(1);
   tvxSetAllocator([](std::size_t) -> void* { return nullptr; });
@@ -367,6 +390,22 @@ TEST_F(Targets, AStoppedTreeIsNotScanned) {
   EXPECT_EQ(port().getNumberOfTargets(), 1U);
 }
 
+TEST_F(Targets, AStoppedScanLeavesTheOtherPortsAndAdaptersAlone) {
+  host.add("Torvex-A1", 2);
+  host.add("Torvex-A2", 1);
+  data.buildAdapterData();
+  addRow(1);
+  host.libraries.provide(HBA_SendReadCapacity, [this](HBA_HANDLE handle, HBA_WWN, HBA_UINT64, void*,
+                                                      HBA_UINT32, void*, HBA_UINT32) {
+    if (handle == 2) data.stopScan();
+    return HBA_STATUS{0};
+  });
+  data.buildSANData();
+  EXPECT_EQ(asked.size(), 2U) << "the only port of the first adapter, the first of the second";
+  EXPECT_EQ(data.m_Ports.at(1)->getNumberOfTargets(), 1U) << "what was under way is kept";
+  EXPECT_FALSE(capture.has(TVX_DBG, "Target Scan from adapter: Torvex-A2"));
+}
+
 TEST_F(Targets, ThePortAfterOneThatVanishedIsScanned) {
   host.add("Torvex-A1", 2);
   data.buildAdapterData();
@@ -383,6 +422,42 @@ TEST_F(Targets, ThePortAfterOneThatVanishedIsScanned) {
   EXPECT_EQ(data.m_Ports[0]->getNumberOfTargets(), 1U);
   EXPECT_EQ(data.m_Ports[1]->getNumberOfTargets(), 0U);
   EXPECT_EQ(data.m_Ports[2]->getNumberOfTargets(), 1U);
+}
+
+// ---- The trace ----
+
+TEST_F(Targets, AScanIsToldStepByStepAndEachCommandOnceBeforeItIsSent) {
+  callsAreMarked = true;
+  host.libraries.provide(HBA_RefreshInformation, [this](HBA_HANDLE) { mark("refresh"); });
+  addRow(0x1F);
+  statuses = {8, 7};
+  firstStatuses[STANDARD] = {9};
+  answers[STANDARD].second = "\x04";
+  answers[SERIAL].first = 9;
+  answers[IDENTIFICATION].first = 9;
+  answers[CAPACITY].first = 12;
+  data.buildSANData();
+  const std::string failure = FAILURE;
+  EXPECT_THAT(
+      capture.texts(),
+      ElementsAre("buildSANData", "Target Scan from adapter: Torvex-A0", "FCAdapter::rescanTargets",
+                  "FCPort::rescanTargets",  //
+                  "To retry the HBA_GetFcpTargetMapping command", "Deleting the allocated memory",
+                  "-> mapping of 256", "-> refresh", "Refresh and retry ... ",
+                  "To retry the HBA_GetFcpTargetMapping command", "Deleting the allocated memory",
+                  "-> mapping of 256", "Increasing the buffer to = 1",
+                  "To retry the HBA_GetFcpTargetMapping command", "Deleting the allocated memory",
+                  "-> mapping of 1", "All Ok ...break ", "Successful target info fetched",  //
+                  "Creating Target...", "Node WWN: 510000000000001F", "Port WWN: 500000000000001F",
+                  "SCSI Inquiry with 0, 0", "-> command 0", "-> command 0", "DeviceType......4",
+                  "SCSI Inquiry with 1, 0x80", "-> command 128", "-> command 128", "-> command 128",
+                  failure + "9.",  //
+                  "SCSI Inquiry with 1, 0x83", "-> command 131", "-> command 131", "-> command 131",
+                  failure + "9.", SENSE,  //
+                  "Send Read Capacity", "-> command 256", failure + "12.",
+                  "End Creating Target..."));
+  for (const Logged& line : capture.lines())
+    EXPECT_EQ(line.level, line.text.starts_with("-> ") ? CALL : TVX_DBG) << line.text;
 }
 
 // ---- One unit ----
@@ -601,9 +676,7 @@ TEST_F(Targets, AFailedIdentificationLogsTheSenseData) {
   EXPECT_EQ(id.identifierType, 0U);
   EXPECT_EQ(id.identifierLength, 0U);
   EXPECT_TRUE(isZero(id.identifier.data(), id.identifier.size()));
-  std::string sense = "Sense Data: ";
-  for (int i = 0; i < 24; ++i) sense += "5a ";
-  EXPECT_EQ(capture.count(TVX_DBG, sense), 1U);
+  EXPECT_EQ(capture.count(TVX_DBG, SENSE), 1U);
   EXPECT_EQ(failures(9), 1U);
 }
 
