@@ -637,7 +637,7 @@ TEST_F(Targets, EveryCommandIsTriedThreeTimes) {
 }
 
 TEST_F(Targets, AUnitThatRecoversIsTakenAsItAnswers) {
-  std::string page(36, ' ');
+  std::string page(96, 'x');
   page[0] = '\x05';
   page.replace(8, 6, "VENDOR");
   answers[STANDARD].second = page;
@@ -649,7 +649,8 @@ TEST_F(Targets, AUnitThatRecoversIsTakenAsItAnswers) {
   const Target& target = scanOne();
   EXPECT_EQ(sent.size(), 12U);
   EXPECT_EQ(target.deviceType, 5U);
-  EXPECT_EQ(target.vendor, "VENDOR  ");
+  EXPECT_EQ(target.vendor, "VENDORxx");
+  EXPECT_EQ(target.revision, "xxxx");
   EXPECT_EQ(target.serialNumber, "SER1");
   EXPECT_EQ(target.deviceIdentification.identifierType, 2U);
   EXPECT_EQ(target.blockCount, 7U);
