@@ -204,6 +204,26 @@ TEST_F(SAN_Concurrency, ReadersOnAStaleCacheWaitForTheNewScan) {
   awaitIdle(agent);
 }
 
+TEST_F(SAN_Concurrency, ReaderThatComesDuringAScanIsServedByIt) {
+  constexpr unsigned long UNITS = 30;
+  ProviderAgent& agent = buildUnits(R"({"count": 30})");
+  agent.m_bSANRefreshSetting = false;
+  refresh(agent);
+  ASSERT_FALSE(agent.m_bIsSANMapsReady);
+  tvxsim_forget_calls();
+  addFault(R"({"call": "HBA_SendReadCapacity", "delay_ms": 2})");
+  Delivered first, second;
+  std::thread reader(
+      [&] { agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, first.handler()); });
+  awaitScanned(2);
+  agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, second.handler());
+  reader.join();
+  awaitIdle(agent);
+  EXPECT_EQ(first.size(), UNITS);
+  EXPECT_EQ(second.size(), UNITS);
+  EXPECT_EQ(unitsScanned(), UNITS) << "it asked for a scan that was under way";
+}
+
 TEST_F(SAN_Concurrency, ReadersOfAdapterClassesWaitForAScanToEnd) {
   constexpr unsigned long UNITS = 30;
   ProviderAgent& agent = buildUnits(R"({"count": 30})");

@@ -136,6 +136,13 @@ TEST_F(Refresh, ReadinessMovesFromGroupToGroup) {
   refresh(agent);
   EXPECT_EQ(readiness.take(), (Moments{"rrr", "b-r", "rb-"}));
   EXPECT_EQ(readiness.now(), "rr-");
+  // A scan alone touches neither of the adapter groups.
+  for (const char* before : {"rr-", "rrr"}) {
+    agent.m_bSANRefreshPending = true;
+    agent.BuildCimrtInfo();
+    awaitIdle(agent);
+    EXPECT_EQ(readiness.take(), (Moments{before, "rr-", "rrb"}));
+  }
 }
 
 #ifndef NDEBUG  // locks are only booked in debug builds
@@ -277,6 +284,31 @@ TEST_F(Refresh, SANReaderIsServedThoughARunMakesItsMapsStaleOnTheWay) {
   }
   awaitIdle(agent);
   EXPECT_GE(log.count(SAN_MAPS), 1u);
+}
+
+TEST_F(Refresh, SANReaderAsksAgainAfterARunThatDidNotServeIt) {
+  ProviderAgent& agent = startAgent();
+  refresh(agent);
+  agent.m_bSANRefreshSetting = false;
+  turnClock(11 * 60 * SECOND);
+  log.clear();
+  Delivered delivered;
+  std::thread reader;
+  {
+    Ranked_Lock lock(agent.m_ThreadMutex);
+    reader = std::thread(
+        [&] { agent.enumSANInstances(agent.m_TVXHBA_StorageVolume_map, delivered.handler()); });
+    // It found its maps ready and asked for nothing. Before it can wait, they go stale.
+    while (agent.m_ThreadMutex.waiting() == 0) std::this_thread::yield();
+    agent.m_bIsSANMapsReady = false;
+  }
+  reader.join();
+  awaitIdle(agent);
+  EXPECT_GT(delivered.size(), 0u);
+  EXPECT_EQ(delivered.size(), agent.m_TVXHBA_StorageVolume_map.size());
+  // The first run is for the old cache alone.
+  const std::vector<std::string> stages = {BEGIN, ADAPTER_DATA, ADAPTER_MAPS, BEGIN, SAN_DATA};
+  EXPECT_EQ(log.only(stages), stages);
 }
 
 TEST_F(Refresh, FailedMapBuildLeavesTheMapsReadyAsTheyStandAndTheNextRunRepairsThem) {

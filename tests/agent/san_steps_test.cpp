@@ -255,9 +255,14 @@ TEST_F(San_Steps, RemotePortsLeadToTheChipsOfTheirOwnPorts) {
 }
 
 TEST_F(San_Steps, RemotePortOfNoPortTakesTheLastOne) {
-  ProviderAgent& agent = buildUnits(R"({"count": 1})");
+  ProviderAgent& agent = build(TWO_CARDS);
+  ASSERT_GE(agent.m_TVXHBA_Chip_map.size(), 2u);
+  log.clear();
   EXPECT_EQ(findPortTarget(agent, "1111111111111111|500C0FF12A001001").chip,
-            agent.m_TVXHBA_Chip_map[0]);
+            agent.m_TVXHBA_Chip_map[agent.m_TVXHBA_Chip_map.size() - 1]);
+  EXPECT_EQ(log.count("Set content: 1111111111111111|500C0FF12A001001"), 1u);
+  EXPECT_EQ(log.count("Found the FCPort Instance: 10000254560A7E21"), 0u)
+      << "it was not looked for";
   agent.m_TVXHBA_FCPort_map.clear();
   EXPECT_EQ(findPortTarget(agent, ENTRY).chip, nullptr);
 }
@@ -286,6 +291,19 @@ TEST_F(San_Steps, LastPortOfAChipDecidesWhatTheChipTells) {
   };
   EXPECT_EQ(chipBehind("false", "true"), 1);
   EXPECT_EQ(chipBehind("true", "false"), 0);
+}
+
+TEST_F(San_Steps, RemotePortsAreVisitedOnceAndForgotten) {
+  ProviderAgent& agent = buildUnits(R"({"count": 1})");
+  San_Build san{agent};
+  san.portTargets = {ENTRY};
+  log.clear();
+  EXPECT_EQ(visitPortTargets(san), 0);
+  EXPECT_TRUE(san.portTargets.empty());
+  EXPECT_EQ(log.count("No entries in the set"), 0u);
+  EXPECT_EQ(visitPortTargets(san), 0);
+  EXPECT_EQ(log.count(std::string("Set content: ") + ENTRY), 1u);
+  EXPECT_EQ(log.level("No entries in the set"), TVX_WARN);
 }
 
 TEST_F(San_Steps, EntryWithoutATargetIsTakenAsItIs) {
