@@ -74,6 +74,16 @@ TEST(LunsTest, AUnitThatAnsweredNothingIsMarked) {
   EXPECT_EQ(targetMark({row, lunRows({endpoint(LUN6)}, {}).at(0)}), '+');
 }
 
+TEST(LunsTest, OneKnownNameIsAnAnswer) {
+  const char* const vendor = "ACME     Unknown Revision 1    Serial Number Unknown";
+  const LunRow known = lunRows({endpoint(LUN5, vendor, "Unknown")}, {}).at(0);
+  EXPECT_EQ(known.vendor, "ACME");
+  EXPECT_EQ(known.revision, "1");
+  EXPECT_TRUE(known.answers);
+  const char* const model = "Unknown  ARRAY 7200       Revision 0410 Serial Number SN1";
+  EXPECT_TRUE(lunRows({endpoint(LUN5, model)}, {}).at(0).answers);
+}
+
 TEST(LunsTest, OddInstancesAreLeftOutOrLeftBare) {
   Instance nameless;
   nameless.properties = {{"Name", Value::string("odd")}};
@@ -92,6 +102,9 @@ TEST(LunsTest, LunsAreNumbersWhereTheirFormIsKnown) {
       {"7FFF000000000000", "16383"},
       {"D200400000000000", "16384"},
       {"0005000100000000", "0005000100000000"},
+      {"0105000000000000", "0105000000000000"},
+      {"8005000000000000", "8005000000000000"},
+      {"D200400000000001", "D200400000000001"},
       {"C101000000000000", "C101000000000000"},
       {"ZZ01000000000000", "ZZ01000000000000"},
   };

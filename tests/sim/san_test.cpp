@@ -88,6 +88,42 @@ TEST_F(San, TheMappingHasARowForEachUnit) {
   EXPECT_EQ(row[4].ScsiId.ScsiTargetNumber, 1u);
 }
 
+TEST_F(San, UnitsAreNamedAsASystemWould) {
+  ASSERT_EQ(tvxsim_load_text(R"({"cards": [{"model": "TVX16001", "ports": [{"targets": [
+      {"wwpn": "500C0FF000000001", "luns": [{"count": 27}, {"first": 27, "type": "cdrom"},
+        {"first": 28, "type": "array"}, {"first": 29, "os_device": "/dev/mine"}]}]}]}]})"),
+            0)
+      << tvxsim_last_error();
+  handle = open("Torvex-TVX16001-1");
+  const HBA_FCPSCSIENTRY* row = map(256)->entry;
+  EXPECT_STREQ(row[25].ScsiId.OSDeviceName, "/dev/sdz");
+  EXPECT_STREQ(row[26].ScsiId.OSDeviceName, "/dev/sdaa");
+  EXPECT_STREQ(row[27].ScsiId.OSDeviceName, "/dev/sr27");
+  EXPECT_STREQ(row[28].ScsiId.OSDeviceName, "/dev/sg28");
+  EXPECT_STREQ(row[29].ScsiId.OSDeviceName, "/dev/mine29");
+}
+
+TEST_F(San, EachPortIsABusOfItsAdapter) {
+  ASSERT_EQ(tvxsim_load_text(R"({"cards": [{"model": "TVX16001", "adapter_per": "card", "ports": [
+      {"targets": [{"wwpn": "500C0FF000000001", "luns": {"count": 1}}]},
+      {"targets": [{"wwpn": "500C0FF000000002", "luns": {"count": 1}}]}]}]})"),
+            0)
+      << tvxsim_last_error();
+  handle = open("Torvex-TVX16001-1");
+  const HBA_FCPTARGETMAPPING* mapping = map(256);
+  ASSERT_EQ(mapping->NumberOfEntries, 2u);
+  const HBA_FCPSCSIENTRY* row = mapping->entry;
+  EXPECT_EQ(row[0].ScsiId.ScsiBusNumber, 0u);
+  EXPECT_EQ(row[1].ScsiId.ScsiBusNumber, 1u);
+  EXPECT_EQ(number(row[1].FcpId.PortWWN), second_target);
+}
+
+TEST_F(San, AMappingMayTellAnotherCountThanItsOwn) {
+  fault(R"({"call": "HBA_GetFcpTargetMapping", "returned_size": 300})");
+  EXPECT_EQ(map(256)->NumberOfEntries, 300u);
+  EXPECT_EQ(status, 0u);
+}
+
 TEST_F(San, AMappingWithoutRoomTellsTheNeedAndFillsWhatThereIs) {
   const HBA_FCPTARGETMAPPING* mapping = map(2);
   EXPECT_EQ(status, HBA_STATUS_ERROR_MORE_DATA + 0u);
