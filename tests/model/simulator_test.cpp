@@ -118,6 +118,24 @@ TEST_F(Simulated_Host, ShowsTargetsAndKeepsDeadUnitsVisible) {
   EXPECT_EQ(data.m_Ports[2]->getTarget(0)->vendor, "Unknown");
 }
 
+TEST_F(Simulated_Host, AUnitThatIsBusyAtFirstIsAskedAgain) {
+  ASSERT_EQ(ports().size(), 4U);
+  data.buildSANData();
+  const std::uint64_t blocks = data.m_Ports[0]->getTarget(0)->blockCount;
+  const std::string serial = data.m_Ports[0]->getTarget(0)->serialNumber;
+  ASSERT_GT(blocks, 0U);
+  fault(R"({"call": "HBA_SendScsiInquiry", "page": "0x80", "status": 9, "first": 2})");
+  fault(R"({"call": "HBA_SendReadCapacity", "status": 9, "first": 2})");
+  data.buildSANData();
+  EXPECT_EQ(data.m_Ports[0]->getTarget(0)->serialNumber, serial);
+  EXPECT_EQ(data.m_Ports[0]->getTarget(0)->blockCount, blocks);
+  tvxsim_clear_faults();
+  fault(R"({"call": "HBA_SendReadCapacity", "status": 9, "first": 3})");
+  data.buildSANData();
+  EXPECT_EQ(data.m_Ports[0]->getTarget(0)->blockCount, 0U) << "not a fourth time";
+  EXPECT_EQ(data.m_Ports[0]->getTarget(1)->blockCount, blocks);
+}
+
 TEST_F(Simulated_Host, MovesItsStatistics) {
   ASSERT_EQ(ports().size(), 4U);
   const auto* read = dynamic_cast<FCPortStatistics*>(data.m_Ports[0]->refreshStatistics());

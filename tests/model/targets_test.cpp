@@ -428,7 +428,9 @@ TEST_F(Targets, ThePortAfterOneThatVanishedIsScanned) {
 
 TEST_F(Targets, AScanIsToldStepByStepAndEachCommandOnceBeforeItIsSent) {
   callsAreMarked = true;
-  host.libraries.provide(HBA_RefreshInformation, [this](HBA_HANDLE) { mark("refresh"); });
+  host.libraries.provide(HBA_RefreshInformation, [this](HBA_HANDLE handle) {
+    mark("refresh of " + std::to_string(handle));
+  });
   addRow(0x1F);
   statuses = {8, 7};
   firstStatuses[STANDARD] = {9};
@@ -443,7 +445,7 @@ TEST_F(Targets, AScanIsToldStepByStepAndEachCommandOnceBeforeItIsSent) {
       ElementsAre("buildSANData", "Target Scan from adapter: Torvex-A0", "FCAdapter::rescanTargets",
                   "FCPort::rescanTargets",  //
                   "To retry the HBA_GetFcpTargetMapping command", "Deleting the allocated memory",
-                  "-> mapping of 256", "-> refresh", "Refresh and retry ... ",
+                  "-> mapping of 256", "-> refresh of 1", "Refresh and retry ... ",
                   "To retry the HBA_GetFcpTargetMapping command", "Deleting the allocated memory",
                   "-> mapping of 256", "Increasing the buffer to = 1",
                   "To retry the HBA_GetFcpTargetMapping command", "Deleting the allocated memory",
