@@ -159,6 +159,19 @@ TEST(LunsTest, MarksFollowTheState) {
   EXPECT_EQ(cardMark({"m", "s", {}}), '?');
 }
 
+TEST(LunsTest, PortsAndCardsWithoutASerialNumberDoNotBelongTogether) {
+  Instance port;
+  port.properties = {{"DeviceID", Value::string(PORT)}};
+  Instance card;
+  card.properties = {{"Model", Value::string("TVX-1")}};
+  const std::vector<CardNode> nodes = cardNodes({port}, {card});
+  ASSERT_EQ(nodes.size(), 2U);
+  EXPECT_EQ(nodes[0].model, "TVX-1");
+  EXPECT_TRUE(nodes[0].ports.empty());
+  EXPECT_EQ(nodes[1].model, "");
+  ASSERT_EQ(nodes[1].ports.size(), 1U);
+}
+
 TEST(LunsTest, TheTreeMarksWhatDoesNotAnswer) {
   const auto rows = lunRows(
       {endpoint(LUN5, "Unknown Unknown Revision Unkn Serial Number Unknown", "Unknown")}, {});
