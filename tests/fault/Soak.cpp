@@ -5,6 +5,7 @@
 // usage: soak [--seconds N] [--clients N] [--strict] [--report FILE]
 // Ends with 1 if a reply was lost or not what a client expects, a request leaked, an unload was
 // refused, nothing was refreshed, or memory kept growing.
+#include <sys/select.h>
 #include <unistd.h>
 
 #include <algorithm>
@@ -114,6 +115,12 @@ void runClient(Trial& trial, unsigned seed, std::atomic<std::size_t>& beats) {
   trial.tally.add(client.tally());
 }
 
+/// Lets the cache grow older than any setting allows: time passes here as fast as it is slept.
+void passHalfAnHour() {
+  timeval time = {31 * 60, 0};
+  select(0, nullptr, nullptr, nullptr, &time);
+}
+
 /// Cleans providers up while requests run, forces refreshes, and every so often takes the library
 /// down and up again.
 void runServer(Trial& trial) {
@@ -128,6 +135,7 @@ void runServer(Trial& trial) {
       ++trial.cleanUps;
     }
     tvxsim_advance(1);
+    if (round % 5 == 0) passHalfAnHour();
     if (round % 10 != 0) continue;
     const auto lock = trial.own();
     const host::Status status = trial.broker->unload(true);
@@ -242,8 +250,8 @@ int runSoak(const Choice& choice) {
     writeReport(report, trial, memory);
   }
   const bool good = unloaded && trial.refusals == 0 && trial.tally.leaks.empty() &&
-                    trial.tally.lost.empty() && isExpected(trial.tally) &&
-                    refreshes() > trial.lives && memory.isFlat() && trial.tally.requests > 0;
+                    trial.tally.lost.empty() && isExpected(trial.tally) && refreshes() > 0 &&
+                    memory.isFlat() && trial.tally.requests > 0;
   std::cout << (good ? "good\n" : "NOT good\n");
   return good ? 0 : 1;
 }
