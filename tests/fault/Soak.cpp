@@ -155,12 +155,21 @@ constexpr bool UNDER_SANITIZER = false;
 #endif
 
 /// Answers that a client gets when all is well. A request fails that comes between the cleanup of
-/// its provider and the provider's next life.
+/// its provider and the provider's next life, and one that makes or changes something may come when
+/// a refresh has just taken that away.
 const std::map<int, const char*> EXPECTED = {{CMPI_RC_OK, "succeeded"},
                                              {CMPI_RC_ERR_FAILED, "failed"},
+                                             {CMPI_RC_ERR_INVALID_PARAMETER, "were refused"},
                                              {CMPI_RC_ERR_NOT_FOUND, "found nothing"},
                                              {CMPI_RC_ERR_NOT_SUPPORTED, "were not supported"},
                                              {CMPI_RC_ERR_ALREADY_EXISTS, "made what was there"}};
+
+std::string wordsOf(int status, const Client_Tally& tally) {
+  const auto known = EXPECTED.find(status);
+  return known != EXPECTED.end()
+             ? known->second
+             : "had status " + std::to_string(status) + " (" + tally.examples.at(status) + ")";
+}
 
 bool isExpected(const Client_Tally& tally) {
   return std::all_of(tally.byStatus.begin(), tally.byStatus.end(),
@@ -207,12 +216,8 @@ void writeReport(std::ostream& out, const Trial& trial, const Memory& memory) {
       << "| Clients | " << trial.choice.clients << " |\n"
       << "| Seconds | " << trial.choice.time.count() << " |\n"
       << "| Requests answered | " << trial.tally.requests << " |\n";
-  for (const auto& [status, number] : trial.tally.byStatus) {
-    const auto known = EXPECTED.find(status);
-    out << "| Of these "
-        << (known == EXPECTED.end() ? "had status " + std::to_string(status) : known->second)
-        << " | " << number << " |\n";
-  }
+  for (const auto& [status, number] : trial.tally.byStatus)
+    out << "| Of these " << wordsOf(status, trial.tally) << " | " << number << " |\n";
   out << "| Answers without an end | " << trial.tally.lost.size() << " |\n"
       << "| Methods called | " << trial.tally.methods << " |\n"
       << "| Instances delivered | " << trial.tally.instances << " |\n"

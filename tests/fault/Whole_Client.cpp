@@ -17,6 +17,7 @@ void Client_Tally::add(const Client_Tally& other) {
   instances += other.instances;
   methods += other.methods;
   for (const auto& [status, number] : other.byStatus) byStatus[status] += number;
+  examples.insert(other.examples.begin(), other.examples.end());
   leaks.insert(leaks.end(), other.leaks.begin(), other.leaks.end());
   lost.insert(lost.end(), other.lost.begin(), other.lost.end());
 }
@@ -32,7 +33,7 @@ Reply Whole_Client::countWhole(Reply reply, const std::string& what) {
 
 Reply Whole_Client::count(Reply reply, const std::string& what) {
   ++m_Tally.requests;
-  ++m_Tally.byStatus[reply.status.rc];
+  if (++m_Tally.byStatus[reply.status.rc] == 1) m_Tally.examples[reply.status.rc] = what;
   m_Tally.instances += reply.instances.size();
   if (reply.report.leaks()) m_Tally.leaks.push_back(what + ": " + reply.report.text());
   return reply;

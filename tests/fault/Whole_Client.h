@@ -17,6 +17,7 @@ struct Client_Tally {
   std::size_t instances = 0;
   std::size_t methods = 0;
   std::map<int, std::size_t> byStatus;  ///< requests by CMPI return code
+  std::map<int, std::string> examples;  ///< one request of each code
   std::vector<std::string> leaks;       ///< accounts of requests that left something behind
   std::vector<std::string> lost;        ///< requests that succeeded without an end to their answer
 
