@@ -154,9 +154,9 @@ constexpr bool UNDER_SANITIZER = true;
 constexpr bool UNDER_SANITIZER = false;
 #endif
 
-/// Answers that a client gets when all is well. A request fails that comes between the cleanup of
-/// its provider and the provider's next life, and one that makes or changes something may come when
-/// a refresh has just taken that away.
+/// Answers that a client gets when all is well. A request fails that deletes what cannot be deleted
+/// or comes between the cleanup of its provider and the provider's next life, and one that makes or
+/// changes something may come when a refresh has just taken that away.
 const std::map<int, const char*> EXPECTED = {{CMPI_RC_OK, "succeeded"},
                                              {CMPI_RC_ERR_FAILED, "failed"},
                                              {CMPI_RC_ERR_INVALID_PARAMETER, "were refused"},
