@@ -35,6 +35,14 @@ function(tvx_add_library name)
   target_link_libraries(${name} PUBLIC tvx_includes PRIVATE tvx_warnings)
 endfunction()
 
+# tvx_unite(target sources): with TVX_UNITY, compiles so many sources of the target at once. For targets whose sources all
+# read the same large headers of libraries, where a build from nothing takes half the time and one after an edit longer.
+function(tvx_unite target sources)
+  if(TVX_UNITY)
+    set_target_properties(${target} PROPERTIES UNITY_BUILD ON UNITY_BUILD_BATCH_SIZE ${sources})
+  endif()
+endfunction()
+
 # tvx_link_provider_library(target exports): what makes a shared library one that a CIM server loads. The version script
 # `exports` names what leaves it and hides the rest.
 function(tvx_link_provider_library target exports)

@@ -10,10 +10,10 @@
 namespace tvx::host {
 namespace {
 
-constexpr const char* kindNames[] = {"Instance", "Association", "Method"};
+constexpr const char* interfaceNames[] = {"Instance", "Association", "Method"};
 
 const char* nameOf(InterfaceKind kind) {
-  return kindNames[static_cast<std::size_t>(kind)];
+  return interfaceNames[static_cast<std::size_t>(kind)];
 }
 
 using Factory = void* (*)(const CMPIBroker*, const CMPIContext*, CMPIStatus*);

@@ -6,6 +6,8 @@
 #include <cctype>
 #include <filesystem>
 
+#include "cli/ServiceCalls.h"
+
 namespace tvx::host {
 namespace {
 
@@ -13,8 +15,6 @@ struct ResultWords {
   std::uint64_t result;
   const char* words;
 };
-
-constexpr std::uint64_t libraryFailure = 40000;
 
 constexpr ResultWords results[] = {
     {0, "the firmware is installed"},

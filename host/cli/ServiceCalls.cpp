@@ -7,8 +7,6 @@
 namespace tvx::host {
 namespace {
 
-constexpr std::uint64_t libraryFailure = 40000;
-
 struct ResultText {
   std::uint64_t result;
   const char* text;

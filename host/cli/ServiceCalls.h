@@ -28,6 +28,9 @@ std::uint64_t outputNumber(const Reply& reply, const char* name, std::uint64_t m
 /// A text that it gave back; empty where it gave none.
 std::string outputText(const Reply& reply, const char* name);
 
+/// A method's result above this is a status of the adapter library, which has been added to it.
+inline constexpr std::uint64_t libraryFailure = 40000;
+
 /// What the result of a method means, in words.
 std::string resultWords(std::uint64_t result);
 

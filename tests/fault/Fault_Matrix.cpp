@@ -24,6 +24,8 @@
 #include <fstream>
 #include <iostream>
 #include <nlohmann/json.hpp>
+#include <stdexcept>
+#include <string>
 #include <thread>
 #include <utility>
 
@@ -310,17 +312,30 @@ bool isGood(const Row& row) {
   return row.crashes.empty() && row.hangs.empty() && row.leaks == 0;
 }
 
+constexpr const char* USAGE =
+    "usage: fault_matrix [--every N] [--row TEXT] [--mode NAME]... [--jobs N] [--report FILE] "
+    "[--seconds N]";
+
 Choice parse(int argc, char** argv) {
   Choice choice;
-  for (int i = 1; i + 1 < argc; i += 2) {
+  for (int i = 1; i < argc; i += 2) {
     const std::string name = argv[i];
+    if (i + 1 == argc) throw std::invalid_argument(name + " stands alone; " + USAGE);
     const std::string value = argv[i + 1];
-    if (name == "--every") choice.every = std::max(1UL, std::stoul(value));
-    if (name == "--row") choice.row = value;
-    if (name == "--mode") choice.modes.push_back(value);
-    if (name == "--jobs") choice.jobs = std::max(1UL, std::stoul(value));
-    if (name == "--report") choice.report = value;
-    if (name == "--seconds") choice.patience = std::chrono::seconds(std::stol(value));
+    if (name == "--every")
+      choice.every = std::max(1UL, std::stoul(value));
+    else if (name == "--row")
+      choice.row = value;
+    else if (name == "--mode")
+      choice.modes.push_back(value);
+    else if (name == "--jobs")
+      choice.jobs = std::max(1UL, std::stoul(value));
+    else if (name == "--report")
+      choice.report = value;
+    else if (name == "--seconds")
+      choice.patience = std::chrono::seconds(std::stol(value));
+    else
+      throw std::invalid_argument("no option " + name + "; " + USAGE);
   }
   return choice;
 }

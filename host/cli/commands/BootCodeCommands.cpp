@@ -10,10 +10,10 @@
 namespace tvx::host {
 namespace {
 
-constexpr const char* serviceClass = "TVXHBA_BootBIOSService";
+constexpr const char* bootBiosService = "TVXHBA_BootBIOSService";
 
 ExitCode switchBootCode(Session& session, const std::string& port, bool on) {
-  const ServicePort target = findServicePort(session, serviceClass, port);
+  const ServicePort target = findServicePort(session, bootBiosService, port);
   const std::uint64_t result =
       resultNumber(callOnPort(session, target, on ? "EnableBootBIOS" : "DisableBootBIOS"));
   const std::string done = on ? "boot code is on" : "boot code is off";
@@ -22,7 +22,7 @@ ExitCode switchBootCode(Session& session, const std::string& port, bool on) {
 }
 
 ExitCode tellBootCode(Session& session, const std::string& port) {
-  const ServicePort target = findServicePort(session, serviceClass, port);
+  const ServicePort target = findServicePort(session, bootBiosService, port);
   const Reply reply = callOnPort(session, target, "GetBootBIOSStatus");
   const std::uint64_t result = resultNumber(reply);
   const std::uint64_t state = outputNumber(reply, "nBootBIOSStatus", 0);

@@ -21,7 +21,7 @@ namespace tvx::host {
 namespace {
 
 constexpr const char* testClass = "TVXHBA_FCHBADiagnosticTest";
-constexpr const char* settingClass = "TVXHBA_FCHBADiagnosticSettingData";
+constexpr const char* testSettingClass = "TVXHBA_FCHBADiagnosticSettingData";
 constexpr const char* jobSettingClass = "TVXHBA_JobSettingData";
 constexpr const char* completionClass = "TVXHBA_DiagnosticCompletionRecord";
 constexpr const char* jobClass = "TVXHBA_ConcreteJob";
@@ -227,7 +227,7 @@ NamedValues argumentsOf(Session& session, const DiagWords& words, const Instance
   arguments.set("ManagedElement", Value::reference(controller.path));
   if (!words.settings.empty()) {
     arguments.set("DiagnosticSettings",
-                  settingsOf(session, settingClass, test.text("Name"), words.settings));
+                  settingsOf(session, testSettingClass, test.text("Name"), words.settings));
   }
   if (words.deleteJob) {
     const Instance shared = onlyInstanceOf(session, jobSettingClass);

@@ -13,7 +13,7 @@
 namespace tvx::host {
 namespace {
 
-constexpr const char* serviceClass = "TVXHBA_DumpService";
+constexpr const char* dumpService = "TVXHBA_DumpService";
 constexpr const char* settingsClass = "TVXHBA_DumpData";
 constexpr std::uint32_t fewestKept = 1;
 constexpr std::uint32_t mostKept = 20;
@@ -25,7 +25,7 @@ struct DumpWords {
 
 ExitCode runDumpMethod(Session& session, const DumpWords& words, const char* method,
                        const char* done) {
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, dumpService, words.port);
   const std::uint64_t result = resultNumber(callOnPort(session, on, method));
   return tellOutcome(session, "dump", on.wwpn, result, result == 0 ? done : resultWords(result));
 }
@@ -41,7 +41,7 @@ Instance settingsOf(Session& session, const Instance& port) {
 }
 
 ExitCode listDumps(Session& session, const DumpWords& words) {
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, dumpService, words.port);
   const Reply reply = callOnPort(session, on, "GetDumpFileNames");
   if (const std::uint64_t result = resultNumber(reply); result != 0) {
     return tellOutcome(session, "dumps", on.wwpn, result, resultWords(result));

@@ -22,7 +22,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* serviceClass = "TVXHBA_SoftwareInstallationService";
+constexpr const char* installationService = "TVXHBA_SoftwareInstallationService";
 constexpr std::uint64_t resetOption = 2;
 constexpr std::uint64_t fileNameOption = 32768;
 
@@ -202,7 +202,7 @@ ExitCode showFirmware(Session& session, const FirmwareWords& words) {
 std::uint64_t install(Session& session, const FirmwareWords& words, const Instance& port) {
   constexpr std::chrono::milliseconds terminalStep{1000};
   constexpr std::chrono::milliseconds logStep{10'000};
-  const Instance service = onlyInstanceOf(session, serviceClass);
+  const Instance service = onlyInstanceOf(session, installationService);
   const WorkFolder folder;
   Call call = callFor(words, port.path, folder);
   const bool terminal = isatty(STDERR_FILENO) != 0;

@@ -14,7 +14,7 @@
 namespace tvx::host {
 namespace {
 
-constexpr const char* settingClass = "TVXHBA_ProviderConfigSetting";
+constexpr const char* configSettingClass = "TVXHBA_ProviderConfigSetting";
 
 struct SettingWords {
   std::string name;
@@ -36,7 +36,7 @@ nlohmann::ordered_json settingJson(const Instance& setting) {
 }
 
 ExitCode printSettings(Session& session) {
-  const std::vector<Instance> settings = instancesOf(session, settingClass);
+  const std::vector<Instance> settings = instancesOf(session, configSettingClass);
   if (session.options().format == Format::Json) {
     nlohmann::ordered_json list = nlohmann::ordered_json::array();
     for (const Instance& setting : settings) {
@@ -61,7 +61,7 @@ ExitCode printSettings(Session& session) {
 
 Instance findSetting(Session& session, const std::string& name) {
   std::string known;
-  for (Instance& each : instancesOf(session, settingClass)) {
+  for (Instance& each : instancesOf(session, configSettingClass)) {
     if (each.text("paramname") == name) {
       return std::move(each);
     }

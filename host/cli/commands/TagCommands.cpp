@@ -15,7 +15,7 @@
 namespace tvx::host {
 namespace {
 
-constexpr const char* serviceClass = "TVXHBA_FCTagService";
+constexpr const char* tagService = "TVXHBA_FCTagService";
 
 struct TagWords {
   std::string port;
@@ -55,7 +55,7 @@ ExitCode tell(Session& session, const ServicePort& on, std::uint64_t result,
 }
 
 ExitCode runFlag(Session& session, const TagWords& words) {
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, tagService, words.port);
   if (words.flag) {
     const Reply reply = callOnPort(session, on, "SetGlobalFlag",
                                    {{"State", Value::number(CMPI_uint32, *words.flag)}});
@@ -86,7 +86,7 @@ ExitCode runGet(Session& session, const TagWords& words) {
         ExitCode::BadArgument,
         "a table goes to a file in the port's dump folder; give its name, not a URI");
   }
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, tagService, words.port);
   const std::uint64_t result =
       resultNumber(callOnPort(session, on, "GetConfigTable", {{"URI", Value::string(words.file)}}));
   const std::filesystem::path path = tablePath(session, on, words.file);
@@ -103,7 +103,7 @@ ExitCode runGet(Session& session, const TagWords& words) {
 }
 
 ExitCode runSet(Session& session, const TagWords& words) {
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, tagService, words.port);
   const std::string uri = isRemote(words.file) ? words.file : localPath(words.file);
   const Reply reply = callOnPort(session, on, "SetConfigTable", {{"URI", Value::string(uri)}});
   return tell(session, on, resultNumber(reply),

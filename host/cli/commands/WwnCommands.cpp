@@ -15,7 +15,7 @@
 namespace tvx::host {
 namespace {
 
-constexpr const char* serviceClass = "TVXHBA_FCHBAWWNService";
+constexpr const char* wwnService = "TVXHBA_FCHBAWWNService";
 constexpr std::uint64_t noStatus = 65535;
 
 struct WwnWords {
@@ -125,7 +125,7 @@ std::vector<std::string> capabilityWords(std::uint64_t capability) {
 }
 
 ExitCode showNames(Session& session, const WwnWords& words) {
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, wwnService, words.port);
   const Reply reply = callOnPort(session, on, "GetWWNCapability");
   const std::vector<std::string> changeable =
       capabilityWords(outputNumber(reply, "WWNCapability", 0));
@@ -177,7 +177,7 @@ std::string digitsOf(const std::string& words) {
 ExitCode setNames(Session& session, const WwnWords& words) {
   const std::string wwpn = digitsOf(words.wwpn);
   const std::string wwnn = digitsOf(words.wwnn);
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, wwnService, words.port);
   const Reply reply =
       callOnPort(session, on, "ChangeWWN",
                  {{"NewWWPN", Value::string(wwpn)},
@@ -193,7 +193,7 @@ ExitCode setNames(Session& session, const WwnWords& words) {
 
 /// A failed restore shows in its status alone.
 ExitCode restoreNames(Session& session, const WwnWords& words) {
-  const ServicePort on = findServicePort(session, serviceClass, words.port);
+  const ServicePort on = findServicePort(session, wwnService, words.port);
   const Reply reply =
       callOnPort(session, on, "RestoreWWN",
                  {{"Type", Value::number(CMPI_uint16, words.nonVolatile ? 1U : 0U)}});
