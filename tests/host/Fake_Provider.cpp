@@ -398,37 +398,52 @@ CMPIStatus invoke(CMPIMethodMI*, const CMPIContext* context, const CMPIResult* r
 
 // ---- Factories ----
 
+/// A factory may be called while requests run on other threads: those read the broker and the
+/// tables, which are therefore written but once.
+void useBroker(const CMPIBroker* given) {
+  if (broker != given) broker = given;
+}
+
 CMPIInstanceMI* instanceInterface() {
-  static CMPIInstanceMIFT table{};
-  table.ftVersion = table.miVersion = CMPIVersion100;
-  table.miName = "fake";
-  table.cleanup = cleanupInstance;
-  table.enumerateInstanceNames = enumerateNames;
-  table.enumerateInstances = enumerate;
-  table.getInstance = get;
-  table.createInstance = create;
-  table.modifyInstance = modify;
-  table.deleteInstance = remove;
-  table.execQuery = query;
+  static CMPIInstanceMIFT table = [] {
+    CMPIInstanceMIFT made{};
+    made.ftVersion = made.miVersion = CMPIVersion100;
+    made.miName = "fake";
+    made.cleanup = cleanupInstance;
+    made.enumerateInstanceNames = enumerateNames;
+    made.enumerateInstances = enumerate;
+    made.getInstance = get;
+    made.createInstance = create;
+    made.modifyInstance = modify;
+    made.deleteInstance = remove;
+    made.execQuery = query;
+    return made;
+  }();
   static CMPIInstanceMI interface { nullptr, &table };
   return &interface;
 }
 
 CMPIAssociationMI* associationInterface() {
-  static CMPIAssociationMIFT table{};
-  table.cleanup = cleanupAssociation;
-  table.associators = associators;
-  table.associatorNames = associatorNames;
-  table.references = references;
-  table.referenceNames = referenceNames;
+  static CMPIAssociationMIFT table = [] {
+    CMPIAssociationMIFT made{};
+    made.cleanup = cleanupAssociation;
+    made.associators = associators;
+    made.associatorNames = associatorNames;
+    made.references = references;
+    made.referenceNames = referenceNames;
+    return made;
+  }();
   static CMPIAssociationMI interface { nullptr, &table };
   return &interface;
 }
 
 CMPIMethodMI* methodInterface() {
-  static CMPIMethodMIFT table{};
-  table.cleanup = cleanupMethod;
-  table.invokeMethod = invoke;
+  static CMPIMethodMIFT table = [] {
+    CMPIMethodMIFT made{};
+    made.cleanup = cleanupMethod;
+    made.invokeMethod = invoke;
+    return made;
+  }();
   static CMPIMethodMI interface { nullptr, &table };
   return &interface;
 }
@@ -440,20 +455,20 @@ CMPIMethodMI* methodInterface() {
 FAKE_EXPORT CMPIInstanceMI* FAKE_Widget_Provider_Create_InstanceMI(const CMPIBroker* mb,
                                                                    const CMPIContext*,
                                                                    CMPIStatus*) {
-  broker = mb;
+  useBroker(mb);
   return instanceInterface();
 }
 
 FAKE_EXPORT CMPIMethodMI* FAKE_Widget_Provider_Create_MethodMI(const CMPIBroker* mb,
                                                                const CMPIContext*, CMPIStatus*) {
-  broker = mb;
+  useBroker(mb);
   return methodInterface();
 }
 
 // Only the short form of the name, which a broker has to try as well.
 FAKE_EXPORT CMPIInstanceMI* FAKE_Gadget_Create_InstanceMI(const CMPIBroker* mb, const CMPIContext*,
                                                           CMPIStatus*) {
-  broker = mb;
+  useBroker(mb);
   return instanceInterface();
 }
 
@@ -467,6 +482,6 @@ FAKE_EXPORT CMPIInstanceMI* FAKE_Link_Provider_Create_InstanceMI(const CMPIBroke
 FAKE_EXPORT CMPIAssociationMI* FAKE_Link_Provider_Create_AssociationMI(const CMPIBroker* mb,
                                                                        const CMPIContext*,
                                                                        CMPIStatus*) {
-  broker = mb;
+  useBroker(mb);
   return associationInterface();
 }
