@@ -14,7 +14,8 @@ every=${1:-1}
 seconds=${2:-120}
 reports="$root/build/reliability"
 mkdir -p "$reports"
-run() { LD_LIBRARY_PATH="$root/build/$1/lib" "$root/build/$1/bin/$2" "${@:3}"; }
+# In the reports' folder: the provider fetches files into the working directory.
+run() { (cd "$reports" && LD_LIBRARY_PATH="$root/build/$1/lib" "$root/build/$1/bin/$2" "${@:3}"); }
 
 step "fault matrix, one of $every cells (asan)"
 configure_and_build asan fault_matrix
